@@ -1,0 +1,185 @@
+// Instance life cycle: create (with or without defaults), clone, ref/unref.
+//
+// create(mc, with_defaults): zeroed memory already holds empty strings, zero
+// datetimes, empty arrays and null references, so only defaults and null
+// flags need writing.  With defaults, a property with a default value gets a
+// copy of it; every other property is null.  Without, nothing is null.
+#include "framework/Instance.h"
+
+#include <cstdlib>
+#include <cstring>
+#include <new>
+
+#include "framework/Type_Visit.h"
+
+namespace cimple {
+
+const Meta_Class Instance_meta_class = {
+    0, FLAG_CLASS, "Instance", 0, nullptr, nullptr, 0, sizeof(Instance), nullptr, nullptr, 0, nullptr,
+};
+
+namespace {
+
+inline std::atomic_ref<uint32_t> counter(const Instance* instance) {
+  return std::atomic_ref<uint32_t>(const_cast<Instance*>(instance)->refs);
+}
+
+template <class T>
+T default_scalar(const void* data) {
+  if constexpr (std::is_same_v<T, String>) {
+    return String(*static_cast<const char* const*>(data));
+  } else if constexpr (std::is_same_v<T, Datetime>) {
+    Datetime dt;
+    dt.set(*static_cast<const char* const*>(data));
+    return dt;
+  } else {
+    return *static_cast<const T*>(data);
+  }
+}
+
+template <class T>
+T default_element(const void* data, size_t i) {
+  if constexpr (std::is_same_v<T, String> || std::is_same_v<T, Datetime>)
+    return default_scalar<T>(static_cast<const char* const*>(data) + i);
+  else
+    return static_cast<const T*>(data)[i];
+}
+
+void apply_default(Instance* instance, const Meta_Property* mp) {
+  void* where = slot(instance, mp->offset);
+  const Meta_Value* value = mp->value;
+  visit_type(mp->type, [&](auto tag) {
+    using T = typename decltype(tag)::type;
+    if (is_array(mp)) {
+      auto* array = static_cast<Array<T>*>(where);
+      for (uint32_t i = 0; i < value->count; ++i) array->append(default_element<T>(value->data, i));
+    } else {
+      *static_cast<T*>(where) = default_scalar<T>(value->data);
+    }
+  });
+}
+
+// Turns the bitwise copy of a property into an independent copy.
+void own_copied_property(Instance* copy, const Meta_Property* mp) {
+  void* where = slot(copy, mp->offset);
+  visit_type(mp->type, [&](auto tag) {
+    using T = typename decltype(tag)::type;
+    if (is_array(mp)) {
+      const Array<T>& shared = *static_cast<const Array<T>*>(where);
+      new (where) Array<T>(shared.deep_copy());
+    } else if constexpr (!std::is_trivially_copyable_v<T>) {
+      const T& shared = *static_cast<const T*>(where);
+      new (where) T(shared);
+    }
+  });
+}
+
+void release_property(Instance* instance, const Meta_Property* mp) {
+  void* where = slot(instance, mp->offset);
+  visit_type(mp->type, [&](auto tag) {
+    using T = typename decltype(tag)::type;
+    if (is_array(mp))
+      static_cast<Array<T>*>(where)->~Array<T>();
+    else if constexpr (!std::is_trivially_destructible_v<T>)
+      static_cast<T*>(where)->~T();
+  });
+}
+
+Instance* allocate(const Meta_Class* mc) {
+  void* mem = std::calloc(1, mc->size);
+  if (mem == nullptr) throw std::bad_alloc();
+  Instance* instance = static_cast<Instance*>(mem);
+  instance->magic = kInstanceMagic;
+  instance->refs = 1;
+  instance->meta_class = mc;
+  return instance;
+}
+
+void destroy_record(Instance* instance) {
+  const Meta_Class* mc = instance->meta_class;
+  for (size_t i = 0; i < mc->num_meta_features; ++i) {
+    const Meta_Feature* mf = mc->meta_features[i];
+    if (mf->flags & FLAG_PROPERTY) {
+      release_property(instance, reinterpret_cast<const Meta_Property*>(mf));
+    } else if (mf->flags & FLAG_REFERENCE) {
+      auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
+      if (is_reference_array(mr))
+        static_cast<Array<Instance*>*>(slot(instance, mr->offset))->~Array<Instance*>();
+      else
+        unref(reference_slot(instance, mr));
+    }
+  }
+  instance->__name_space.~String();
+  instance->magic = 0;
+  std::free(instance);
+}
+
+}  // namespace
+
+Instance* create(const Meta_Class* mc, bool with_defaults) {
+  Instance* instance = allocate(mc);
+  if (!with_defaults) return instance;
+  for (size_t i = 0; i < mc->num_meta_features; ++i) {
+    const Meta_Feature* mf = mc->meta_features[i];
+    if (!(mf->flags & FLAG_PROPERTY)) continue;
+    auto* mp = reinterpret_cast<const Meta_Property*>(mf);
+    if (mp->value)
+      apply_default(instance, mp);
+    else
+      *null_flag(instance, mp) = 1;
+  }
+  return instance;
+}
+
+Instance* create(const Meta_Method* mm) {
+  return allocate(reinterpret_cast<const Meta_Class*>(mm));
+}
+
+Instance* clone(const Instance* source) {
+  const Meta_Class* mc = source->meta_class;
+  void* mem = std::malloc(mc->size);
+  if (mem == nullptr) throw std::bad_alloc();
+  std::memcpy(mem, static_cast<const void*>(source), mc->size);
+  Instance* copy = static_cast<Instance*>(mem);
+  copy->refs = 1;
+  new (&copy->__name_space) String(source->__name_space);
+  for (size_t i = 0; i < mc->num_meta_features; ++i) {
+    const Meta_Feature* mf = mc->meta_features[i];
+    if (mf->flags & FLAG_PROPERTY) {
+      own_copied_property(copy, reinterpret_cast<const Meta_Property*>(mf));
+    } else if (mf->flags & FLAG_REFERENCE) {
+      auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
+      if (is_reference_array(mr)) {
+        const Array<Instance*>& shared = *static_cast<const Array<Instance*>*>(slot(source, mr->offset));
+        Array<Instance*>* fresh = new (slot(copy, mr->offset)) Array<Instance*>();
+        for (Instance* element : shared) {
+          Instance* element_copy = element ? clone(element) : nullptr;
+          fresh->append(element_copy);
+          unref(element_copy);
+        }
+      } else if (Instance* target = reference_of(source, mr)) {
+        reference_slot(copy, mr) = clone(target);
+      }
+    }
+  }
+  return copy;
+}
+
+void ref(const Instance* instance) {
+  if (instance) counter(instance).fetch_add(1, std::memory_order_relaxed);
+}
+
+void unref(Instance* instance) {
+  if (instance && counter(instance).fetch_sub(1, std::memory_order_acq_rel) == 1) destroy_record(instance);
+}
+
+uint8_t* null_flag(Instance* instance, const Meta_Property* mp) {
+  uint32_t value_size = is_array(mp) ? 8 : (mp->type < 14 ? type_size[mp->type] : 8);
+  return static_cast<uint8_t*>(slot(instance, mp->offset + value_size));
+}
+
+const uint8_t* null_flag(const Instance* instance, const Meta_Property* mp) {
+  return null_flag(const_cast<Instance*>(instance), mp);
+}
+
+}  // namespace cimple

@@ -1,0 +1,60 @@
+// cimple::Instance_Map: the instances of one class in insertion order, owned
+// by the map, answering provider operations with the provider result codes.
+// Look-ups go through a hash index over the key values, so n inserts and n
+// look-ups cost O(n); equality is still decided by key_eq.
+//
+// Not synchronised: the owner serialises access.  Instances handed out are
+// clones; instances handed in are taken over (insert) or copied (create).
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <unordered_map>
+#include <vector>
+
+#include "framework/Instance.h"
+#include "framework/Provider.h"
+
+namespace cimple {
+
+// Hash of an instance's key values, consistent with key_eq.
+size_t key_hash(const Instance* instance);
+
+class Instance_Map {
+ public:
+  explicit Instance_Map(const Meta_Class* meta_class) : meta_class_(meta_class) {}
+  Instance_Map(const Instance_Map&) = delete;
+  Instance_Map& operator=(const Instance_Map&) = delete;
+  ~Instance_Map() { clear(); }
+
+  const Meta_Class* meta_class() const { return meta_class_; }
+  size_t size() const { return instances_.size(); }
+  bool empty() const { return instances_.empty(); }
+  Instance* operator[](size_t i) const { return instances_[i]; }
+
+  // Takes `instance`; answers its index, or -1 (instance not taken) when an
+  // instance with equal keys is present.
+  long insert(Instance* instance);
+  long find(const Instance* keys) const;
+  Instance* lookup(const Instance* keys) const;
+
+  int get_instance(const Instance* keys, Instance*& instance) const;
+  int create_instance(const Instance* instance);
+  int modify_instance(const Instance* model, const Instance* instance);
+  int delete_instance(const Instance* keys);
+  // Hands a clone of each instance, in insertion order, to the handler with
+  // status 0; stops early when the handler answers false.  Answers 0.
+  int enum_instances(const Handler& handler) const;
+
+  void remove(size_t index);
+  void clear();
+
+ private:
+  void rebuild_index();
+
+  const Meta_Class* meta_class_;
+  std::vector<Instance*> instances_;
+  std::unordered_multimap<size_t, size_t> index_;  // key hash -> position
+};
+
+}  // namespace cimple

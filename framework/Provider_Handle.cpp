@@ -1,0 +1,198 @@
+#include "framework/Provider_Handle.h"
+
+#include <array>
+#include <vector>
+
+namespace cimple {
+
+namespace {
+
+// Handler state of the get-instance fallback.
+struct Get_Instance_Search {
+  const Instance* model;
+  Instance* found = nullptr;
+};
+
+bool find_matching(Instance* instance, int, void* data) {
+  auto* search = static_cast<Get_Instance_Search*>(data);
+  if (instance == nullptr) return false;  // closing call
+  if (search->found == nullptr && key_eq(instance, search->model)) {
+    search->found = instance;
+    return false;
+  }
+  unref(instance);
+  return true;
+}
+
+// True when `mr` (a single reference of `association`) points at `source`.
+bool refers_to(const Instance* association, const Meta_Reference* mr, const Instance* source) {
+  if (!is_subclass(mr->meta_class, source->meta_class)) return false;
+  const Instance* target = reference_of(association, mr);
+  return target != nullptr && key_eq(target, source);
+}
+
+bool name_given(const char* s) { return s != nullptr && *s != '\0'; }
+
+struct References_Walk {
+  const Instance* source;
+  const char* role;
+  Handler_Proc proc;
+  void* data;
+};
+
+bool pass_references(Instance* association, int, void* data) {
+  auto* walk = static_cast<References_Walk*>(data);
+  if (association == nullptr) return false;
+  const Meta_Class* mc = association->meta_class;
+  for (size_t i = 0; i < mc->num_meta_features; ++i) {
+    const Meta_Feature* mf = mc->meta_features[i];
+    if (!(mf->flags & FLAG_REFERENCE)) continue;
+    auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
+    if (is_reference_array(mr) || (name_given(walk->role) && !equal_nocase(mr->name, walk->role))) continue;
+    if (refers_to(association, mr, walk->source)) return walk->proc(association, 0, walk->data);
+  }
+  unref(association);
+  return true;
+}
+
+struct Associator_Walk {
+  const Instance* source;
+  const char* result_class;
+  const char* role;
+  const char* result_role;
+  Handler_Proc proc;
+  void* data;
+};
+
+bool class_named_or_ancestor(const char* name, const Meta_Class* mc) {
+  for (const Meta_Class* p = mc; p; p = p->super_meta_class)
+    if (equal_nocase(p->name, name)) return true;
+  return false;
+}
+
+bool pass_associators(Instance* association, int, void* data) {
+  auto* walk = static_cast<Associator_Walk*>(data);
+  if (association == nullptr) return false;
+  const Meta_Class* mc = association->meta_class;
+  bool has_source = false;
+  std::vector<const Meta_Reference*> far_ends;
+  for (size_t i = 0; i < mc->num_meta_features; ++i) {
+    const Meta_Feature* mf = mc->meta_features[i];
+    if (!(mf->flags & FLAG_REFERENCE)) continue;
+    auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
+    if (is_reference_array(mr)) continue;
+    if (!has_source && refers_to(association, mr, walk->source)) {
+      if (!name_given(walk->role) || equal_nocase(mr->name, walk->role)) {
+        has_source = true;
+        continue;
+      }
+      continue;  // matches the source but not the role: neither end
+    }
+    const Instance* target = reference_of(association, mr);
+    if (target == nullptr) continue;
+    if (name_given(walk->result_class) && !class_named_or_ancestor(walk->result_class, target->meta_class))
+      continue;
+    if (name_given(walk->result_role) && !equal_nocase(mr->name, walk->result_role)) continue;
+    far_ends.push_back(mr);
+  }
+  bool go_on = true;
+  if (has_source) {
+    for (const Meta_Reference* mr : far_ends) {
+      Instance* far_end = reference_of(association, mr);
+      ref(far_end);
+      if (!(go_on = walk->proc(far_end, 0, walk->data))) break;
+    }
+  }
+  unref(association);
+  return go_on;
+}
+
+int map_enumeration(int result, int failed, int access_denied) {
+  if (result == ENUM_INSTANCES_FAILED) return failed;
+  if (result == ENUM_INSTANCES_ACCESS_DENIED) return access_denied;
+  return 0;
+}
+
+}  // namespace
+
+template <class... Args>
+int Provider_Handle::call(int operation, Args... args) const {
+  std::array<void*, 8> slots{};
+  size_t i = 0;
+  ((slots[i++] = const_cast<void*>(reinterpret_cast<const void*>(args))), ...);
+  return proc_(registration_, operation, slots[0], slots[1], slots[2], slots[3], slots[4], slots[5], slots[6],
+               slots[7]);
+}
+
+int Provider_Handle::destroy_provider() {
+  int result = call(OPERATION_DESTROY_PROVIDER, provider_);
+  provider_ = nullptr;
+  return result;
+}
+
+const Meta_Class* Provider_Handle::meta_class() const {
+  const Meta_Class* mc = nullptr;
+  call(OPERATION_GET_META_CLASS, &mc);
+  return mc;
+}
+
+const Meta_Repository* Provider_Handle::repository() const {
+  const Meta_Repository* repository = nullptr;
+  call(OPERATION_GET_REPOSITORY, &repository);
+  return repository;
+}
+
+int Provider_Handle::enum_instances(const Instance* model, Handler_Proc proc, void* data) {
+  return call(OPERATION_ENUM_INSTANCES, provider_, model, proc, data);
+}
+
+int Provider_Handle::get_instance(const Instance* model, Instance*& instance) {
+  int result = call(OPERATION_GET_INSTANCE, provider_, model, &instance);
+  if (result != GET_INSTANCE_UNSUPPORTED) return result;
+  Get_Instance_Search search{model};
+  result = enum_instances(model, find_matching, &search);
+  if (result != 0 || search.found == nullptr) {
+    unref(search.found);
+    return GET_INSTANCE_NOT_FOUND;
+  }
+  instance = search.found;
+  return GET_INSTANCE_OK;
+}
+
+int Provider_Handle::enum_references(const Instance* instance, const Instance* model, const char* role,
+                                     Handler_Proc proc, void* data) {
+  const Meta_Class* mc = meta_class();
+  if (mc == nullptr || !(mc->flags & FLAG_ASSOCIATION)) return ENUM_REFERENCES_FAILED;
+  int result = call(OPERATION_ENUM_REFERENCES, provider_, instance, model, role, proc, data);
+  if (result != ENUM_REFERENCES_UNSUPPORTED) return result;
+  References_Walk walk{instance, role, proc, data};
+  result = map_enumeration(enum_instances(model, pass_references, &walk), ENUM_REFERENCES_FAILED,
+                           ENUM_REFERENCES_ACCESS_DENIED);
+  proc(nullptr, result, data);
+  return result;
+}
+
+int Provider_Handle::enum_associator_names(const Instance* instance, const char* result_class, const char* role,
+                                           const char* result_role, Handler_Proc proc, void* data) {
+  const Meta_Class* mc = meta_class();
+  if (mc == nullptr || !(mc->flags & FLAG_ASSOCIATION)) return ENUM_ASSOCIATOR_NAMES_FAILED;
+  int result = call(OPERATION_ENUM_ASSOCIATOR_NAMES, provider_, instance, result_class, role, result_role, proc,
+                    data);
+  if (result == ENUM_ASSOCIATOR_NAMES_ACCESS_DENIED) return ENUM_ASSOCIATOR_NAMES_FAILED;
+  if (result != ENUM_ASSOCIATOR_NAMES_UNSUPPORTED) return result;
+  Instance* model = create(mc, false);
+  set_null_flags(model, false, true, 1);
+  Associator_Walk walk{instance, result_class, role, result_role, proc, data};
+  result = map_enumeration(enum_instances(model, pass_associators, &walk), ENUM_ASSOCIATOR_NAMES_FAILED,
+                           ENUM_ASSOCIATOR_NAMES_ACCESS_DENIED);
+  unref(model);
+  proc(nullptr, result, data);
+  return result;
+}
+
+int Provider_Handle::enum_associators(const Instance* instance, const char* result_class, const char* role,
+                                      const char* result_role, Handler_Proc proc, void* data) {
+  return call(OPERATION_ENUM_ASSOCIATORS, provider_, instance, result_class, role, result_role, proc, data);
+}
+
+}  // namespace cimple
