@@ -1,0 +1,46 @@
+#include "logging/NRV_SysLogger.h"
+
+#include <syslog.h>
+
+#include "logging/CLogger.h"
+#include "logging/NRV_LogLevels.h"
+
+namespace cimple {
+
+namespace {
+
+// Indexed by level; -1 marks levels that never reach the system log.
+constexpr int kPriorities[kNrvLevelCount] = {
+    -1,           // NRV_INVALID
+    LOG_CRIT,     // NRV_CRIT
+    LOG_WARNING,  // NRV_WARN
+    LOG_ERR,      // NRV_ERR
+    LOG_INFO,     // NRV_INFO
+    -1,           // NRV_DBG: too chatty for the system log
+};
+
+}  // namespace
+
+NRV_SysLogger::NRV_SysLogger(CLogger& logger) : m_Logger(logger) {
+  m_Logger.registerSink(this);
+  openlog(kNrvSyslogIdentity, LOG_NDELAY | LOG_NOWAIT, LOG_USER);
+}
+
+NRV_SysLogger::NRV_SysLogger() : NRV_SysLogger(CLogger::instance()) {}
+
+NRV_SysLogger::~NRV_SysLogger() {
+  m_Logger.unregisterSink(this);
+  closelog();
+}
+
+int NRV_SysLogger::priorityFor(int level) {
+  return (level >= 0 && level < kNrvLevelCount) ? kPriorities[level] : -1;
+}
+
+void NRV_SysLogger::log(int level, const char* file, unsigned line, const char* message) {
+  const int priority = priorityFor(level);
+  if (priority < 0 || message == nullptr) return;
+  syslog(priority, "[%s]\n", message);
+}
+
+}  // namespace cimple
