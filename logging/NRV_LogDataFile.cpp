@@ -26,6 +26,17 @@ using File = std::unique_ptr<std::FILE, FileCloser>;
 constexpr int kSettingsLineMax = 19;
 constexpr int kTracePathMax = 255;
 
+// The comma-separated fields of the first line, in order.  A negative value
+// is always invalid; max < 0 means no upper bound.  A bounded field reports
+// the offending value (as unsigned, so a negative one shows as huge).
+struct SettingField {
+  const char* name;
+  long long max;
+};
+constexpr SettingField kSettingFields[] = {
+    {"Mode", kNrvMaxLogMode}, {"Level", NRV_DBG}, {"Enabled", -1}};
+constexpr size_t kSettingCount = sizeof kSettingFields / sizeof kSettingFields[0];
+
 // The decimal value of one comma-separated field; nullopt when the field is
 // absent or holds no number.
 std::optional<long long> field_value(const std::vector<std::string>& fields, size_t i) {
@@ -134,43 +145,29 @@ void NRV_LogDataFile::read() {
   skip_rest_of_line(f.get(), line);
   const std::vector<std::string> fields = split_commas(line);
 
-  const std::optional<long long> mode = field_value(fields, 0);
-  if (!mode) {
-    NRV_LOG_TO(m_Logger, NRV_ERR, "Unable to read Log Mode from config data file - %s",
-               path.c_str());
-    return;
+  long long values[kSettingCount];
+  for (size_t i = 0; i < kSettingCount; ++i) {
+    const SettingField& field = kSettingFields[i];
+    const std::optional<long long> value = field_value(fields, i);
+    if (!value) {
+      NRV_LOG_TO(m_Logger, NRV_ERR, "Unable to read Log %s from config data file - %s",
+                 field.name, path.c_str());
+      return;
+    }
+    if (*value < 0 || (field.max >= 0 && *value > field.max)) {
+      if (field.max >= 0)
+        NRV_LOG_TO(m_Logger, NRV_ERR, "Invalid value for Log %s from config data file -%s-%u",
+                   field.name, path.c_str(), static_cast<unsigned>(*value));
+      else
+        NRV_LOG_TO(m_Logger, NRV_ERR, "Invalid value for Log %s from config data file - %s",
+                   field.name, path.c_str());
+      return;
+    }
+    values[i] = *value;
   }
-  if (*mode < 0 || *mode > kNrvMaxLogMode) {
-    NRV_LOG_TO(m_Logger, NRV_ERR, "Invalid value for Log Mode from config data file -%s-%u",
-               path.c_str(), static_cast<unsigned>(*mode));
-    return;
-  }
+  const long long mode = values[0], level = values[1], enabled = values[2];
 
-  const std::optional<long long> level = field_value(fields, 1);
-  if (!level) {
-    NRV_LOG_TO(m_Logger, NRV_ERR, "Unable to read Log Level from config data file - %s",
-               path.c_str());
-    return;
-  }
-  if (*level < 0 || *level > NRV_DBG) {
-    NRV_LOG_TO(m_Logger, NRV_ERR, "Invalid value for Log Level from config data file -%s-%u",
-               path.c_str(), static_cast<unsigned>(*level));
-    return;
-  }
-
-  const std::optional<long long> enabled = field_value(fields, 2);
-  if (!enabled) {
-    NRV_LOG_TO(m_Logger, NRV_ERR, "Unable to read Log Enabled from config data file - %s",
-               path.c_str());
-    return;
-  }
-  if (*enabled < 0) {
-    NRV_LOG_TO(m_Logger, NRV_ERR, "Invalid value for Log Enabled from config data file - %s",
-               path.c_str());
-    return;
-  }
-
-  const auto log_mode = static_cast<int32_t>(*mode);
+  const auto log_mode = static_cast<int32_t>(mode);
   if (nrv_mode_writes_file(log_mode)) {
     if (std::fgets(line, kTracePathMax + 1, f.get()) == nullptr) return;
     std::string trace_path = line;
@@ -179,8 +176,8 @@ void NRV_LogDataFile::read() {
     if (m_Logger.setTracePath(trace_path) != 0) return;
   }
 
-  m_Logger.setEnabledValue(*enabled > 0 ? 1 : 0);
-  if (*level > 0 && *level != m_Logger.getLevel()) m_Logger.setLevel(static_cast<int32_t>(*level));
+  m_Logger.setEnabledValue(enabled > 0 ? 1 : 0);
+  if (level > 0 && level != m_Logger.getLevel()) m_Logger.setLevel(static_cast<int32_t>(level));
   m_Logger.setMode(log_mode);
 }
 
