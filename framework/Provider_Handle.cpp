@@ -1,6 +1,5 @@
 #include "framework/Provider_Handle.h"
 
-#include <array>
 #include <vector>
 
 namespace cimple {
@@ -114,15 +113,6 @@ int map_enumeration(int result, int failed, int access_denied) {
 }
 
 }  // namespace
-
-template <class... Args>
-int Provider_Handle::call(int operation, Args... args) const {
-  std::array<void*, 8> slots{};
-  size_t i = 0;
-  ((slots[i++] = const_cast<void*>(reinterpret_cast<const void*>(args))), ...);
-  return proc_(registration_, operation, slots[0], slots[1], slots[2], slots[3], slots[4], slots[5], slots[6],
-               slots[7]);
-}
 
 int Provider_Handle::destroy_provider() {
   int result = call(OPERATION_DESTROY_PROVIDER, provider_);

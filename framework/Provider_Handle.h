@@ -8,6 +8,8 @@
 // destroy_provider() deletes it; the caller brackets the handle's use with them.
 #pragma once
 
+#include <array>
+
 #include "framework/Provider.h"
 
 namespace cimple {
@@ -61,5 +63,16 @@ class Provider_Handle {
   Provider_Proc proc_;
   void* provider_ = nullptr;
 };
+
+// Packs up to eight operation arguments into the procedure's void* slots.
+template <class... Args>
+int Provider_Handle::call(int operation, Args... args) const {
+  static_assert(sizeof...(Args) <= 8, "the procedure takes eight arguments at most");
+  std::array<void*, 8> slots{};
+  size_t i = 0;
+  ((slots[i++] = const_cast<void*>(reinterpret_cast<const void*>(args))), ...);
+  return proc_(registration_, operation, slots[0], slots[1], slots[2], slots[3], slots[4], slots[5], slots[6],
+               slots[7]);
+}
 
 }  // namespace cimple
