@@ -1,0 +1,98 @@
+// A port of an adapter in the data set, of one of four kinds (FC, NIC, iSCSI,
+// FCoE): its attribute set, its statistics and the SCSI targets found behind
+// it.  Every port of an adapter is named by the adapter's identifier.
+//
+// Contract: a port is owned by its adapter and keeps a plain pointer to it
+// (the adapter outlives its ports).  Attributes are read once, by the
+// constructor; statistics are replaced by getStatistics() and targets by
+// rescanTargets(), so both run only under the agent's data lock.  Targets are
+// owned by the port.
+#pragma once
+
+#include <stdint.h>
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "access/RM_Types.h"
+#include "data/NRV_PortAttributes.h"
+#include "data/NRV_Statistics.h"
+#include "data/NRV_Target.h"
+
+namespace cimple {
+
+class Adapter;
+
+// What distinguishes the port kinds: their texts and their statistics class.
+struct PortKind;
+
+class Port {
+ public:
+  Port(const Port&) = delete;
+  Port& operator=(const Port&) = delete;
+  virtual ~Port();
+
+  virtual const PortAttributes* getAttributes() const;
+  // FC, iSCSI and FCoE ports read fresh statistics on every call and keep
+  // them; when the read fails the previous object (null the first time) is
+  // answered.  A NIC port answers its stored object, which stays null.
+  virtual const PortStatistics* getStatistics();
+  virtual Adapter* getAdapter() const;
+  // FC and FCoE ports replace their targets by the HBA API's target mapping;
+  // throws std::runtime_error when the adapter's HBA API handle cannot be
+  // opened.  NIC and iSCSI ports have no targets.
+  virtual void rescanTargets(Adapter& adapter);
+  virtual const std::vector<std::unique_ptr<Target>>& getTargets() const;
+  // Throws std::exception for an index at or past the end.
+  virtual Target* getTarget(size_t index) const;
+  virtual size_t getNumberOfTargets() const;
+
+  // The port identifier text (16 upper-case hex digits).
+  const std::string& getPortName() const { return m_PortName; }
+  uint32_t getPortIndex() const { return m_PortIndex; }
+  // FCoE: the node name ("_NodeWWN"); iSCSI: the initiator name; else "".
+  const std::string& getSecondaryName() const { return m_SecondaryName; }
+
+ protected:
+  Port(const PortKind& kind, Adapter& adapter, uint32_t index,
+       std::unique_ptr<PortAttributes> attributes, const char* secondaryLabel);
+
+ private:
+  const PortKind& m_Kind;
+  std::string m_PortName;
+  uint32_t m_PortIndex;
+  std::unique_ptr<PortAttributes> m_Attributes;
+  std::unique_ptr<PortStatistics> m_Statistics;
+  std::vector<std::unique_ptr<Target>> m_Targets;
+  Adapter* m_Adapter;
+  std::string m_SecondaryName;
+};
+
+// `identifierText` is the adapter identifier (16 upper-case hex digits);
+// `info` the adapter information record.
+class FCPort : public Port {
+ public:
+  FCPort(Adapter& adapter, uint32_t index, const std::string& identifierText,
+         const RM_LOCAL_HBA_INFO_V4& info);
+};
+
+class NICPort : public Port {
+ public:
+  NICPort(Adapter& adapter, uint32_t index, const std::string& identifierText,
+          const RM_LOCAL_HBA_INFO_V4& info);
+};
+
+class iSCSIPort : public Port {
+ public:
+  iSCSIPort(Adapter& adapter, uint32_t index, const std::string& identifierText,
+            const RM_LOCAL_HBA_INFO_V4& info);
+};
+
+class FCoEPort : public Port {
+ public:
+  FCoEPort(Adapter& adapter, uint32_t index, const std::string& identifierText,
+           const RM_LOCAL_HBA_INFO_V4& info);
+};
+
+}  // namespace cimple
