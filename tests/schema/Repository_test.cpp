@@ -267,5 +267,59 @@ TEST(Lookups, FeaturesAreFoundCaseInsensitivelyByKind) {
   EXPECT_EQ(find_feature(log, "NoSuchFeature"), nullptr);
 }
 
+// Methods the catalogue classes inherit from their DMTF ancestors, and the
+// module's own service methods; each must be reachable by name.
+TEST(Lookups, ClassesCarryTheirExtrinsicMethods) {
+  const std::pair<const char*, std::vector<const char*>> expected[] = {
+      {"NRVTAVO_ARPTable", {"RefreshTable"}},
+      {"NRVTAVO_PCIDevice",
+       {"RequestStateChange", "SetPowerState", "Reset", "EnableDevice", "OnlineDevice", "QuiesceDevice",
+        "SaveProperties", "RestoreProperties", "BISTExecution"}},
+      {"NRVTAVO_TapeDrive", {"LockMedia", "Reset"}},
+      {"NRVTAVO_FIPService", {"RequestStateChange", "StartService", "StopService", "ChangeAffectedElementsAssignedSequence"}},
+      {"NRVTAVO_iSCSITargetProtocolEndpoint", {"RequestStateChange", "BroadcastReset"}},
+      {"NRVTAVO_iSCSISession", {"RequestStateChange"}},
+      {"NRVTAVO_ConcreteJob", {"KillJob", "RequestStateChange", "GetError", "GetErrors"}},
+      {"NRVTAVO_EnabledRecordLogCapabilities", {"CreateGoalSettings"}},
+      {"NRVTAVO_PhysicalPackage", {"IsCompatible"}},
+      {"NRVTAVO_ISCSISessionStatistics", {"ResetSelectedStats"}},
+      {"NRVTAVO_DiagnosticTest", {"RunDiagnosticService"}},
+      {"NRVTAVO_HelpService", {"GetHelp"}},
+      {"NRVTAVO_DiagnosticsLog", {"ClearLog"}},
+      {"NRVTAVO_IPConfigurationService", {"ApplySettingToIPProtocolEndpoint"}},
+      {"NRVTAVO_SoftwareInstallationService",
+       {"InstallFromURI", "InstallFromByteStream", "Reset", "SetPortEnabled", "SetSRIOVState", "GetHBAFeatures"}},
+      {"NRVTAVO_DumpService",
+       {"GenerateExtFATDump", "GetDumpFileNames", "DeleteDumpFiles", "SetAdvancedFATDumpTraceLevel",
+        "RestoreAdvancedFATDumpSetting", "GenerateCoreDump", "RetrieveFATDump"}},
+      {"NRVTAVO_FCWWNService", {"ChangeWWN", "RestoreWWN", "ReadWWN", "GetWWNCapability"}},
+      {"NRVTAVO_ChannelMgmtService", {"SetCMMode", "SetCMChannelType", "SetCMBandwidths", "SetCMLPVIDs", "SetVEPAState"}},
+      {"NRVTAVO_DriverParameterService", {"DisableAllOASLuns"}},
+      {"NRVTAVO_iSCSISettingService",
+       {"Ping", "AddTargetPortal", "RemoveTargetPortal", "AddTarget", "RemoveTarget", "TargetLogin", "TargetLogout",
+        "setBootTargetSession", "setTargetLoginProperties", "setTargetProperties", "setTPLoginProperties"}},
+  };
+  for (const auto& [name, methods] : expected) {
+    const Meta_Class* mc = find_meta_class(&nrv_meta_repository, name);
+    ASSERT_NE(mc, nullptr) << name;
+    for (const char* m : methods) EXPECT_NE(find_method(mc, m), nullptr) << name << "." << m;
+  }
+}
+
+TEST(Lookups, SettingDataLinksCarryThePendingFlag) {
+  const Meta_Class* esd = find_meta_class(&nrv_meta_repository, "CIM_ElementSettingData");
+  ASSERT_NE(esd, nullptr);
+  size_t links = 0;
+  for (const char* name : nrv_test::kAssociationProviderClasses) {
+    const Meta_Class* mc = find_meta_class(&nrv_meta_repository, name);
+    if (!is_subclass(esd, mc)) continue;
+    ++links;
+    const Meta_Property* pending = find_property(mc, "IsPending");
+    ASSERT_NE(pending, nullptr) << name;
+    EXPECT_EQ(pending->type, UINT16);
+  }
+  EXPECT_GT(links, 30u);
+}
+
 }  // namespace
 }  // namespace cimple
