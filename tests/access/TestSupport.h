@@ -42,6 +42,13 @@ class LogCapture : public cimple::NRV_LoggerInterface {
       if (e.message.rfind(prefix, 0) == 0 && (level < 0 || e.level == level)) ++n;
     return n;
   }
+  // Number of messages beginning with `prefix` that also contain `needle`.
+  int count(const std::string& prefix, const std::string& needle) const {
+    int n = 0;
+    for (const Entry& e : entries())
+      if (e.message.rfind(prefix, 0) == 0 && e.message.find(needle) != std::string::npos) ++n;
+    return n;
+  }
   bool contains(const std::string& text) const {
     for (const Entry& e : entries())
       if (e.message == text) return true;

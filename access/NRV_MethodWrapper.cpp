@@ -1,0 +1,262 @@
+// Library initialisation under the process's named semaphores, and the
+// wrapper operations that validate, call and log.
+#include "access/NRV_MethodWrapper.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <mutex>
+#include <stdexcept>
+
+#include "logging/Log.h"
+
+namespace cimple {
+namespace {
+
+// Reading the semaphore's value and taking it must be one step, or two
+// wrappers constructed at once could both see the initial value.
+std::mutex g_initMutex;
+
+void waitOn(sem_t* sem) {
+  while (sem_wait(sem) != 0 && errno == EINTR) {
+  }
+}
+
+void closeAndUnlink(sem_t*& sem, const std::string& name) {
+  if (sem == nullptr) return;
+  sem_close(sem);
+  sem_unlink(name.c_str());
+  sem = nullptr;
+}
+
+// Validates `name`, then runs `call`; logs a failure of either.
+template <class Call>
+RM_STATUS validated(const HBA_NAME& name, const char* operation, Call call) {
+  NRV_LOG(NRV_DBG, "Entering NRV_MethodWrapper::%s", operation);
+  if (NRV_MethodWrapper::Validatewwpn(name) != 0) {
+    NRV_LOG(NRV_ERR, "INVALID wwpn");
+    return RM_STATUS_ERROR;
+  }
+  const RM_STATUS status = call();
+  if (status != RM_STATUS_SUCCESS) {
+    NRV_LOG(NRV_ERR, "NRV_MethodWrapper::%s failed with %d", operation, static_cast<int>(status));
+    NRV_MethodWrapper::logStatus(status);
+  }
+  return status;
+}
+
+}  // namespace
+
+std::string NRV_MethodWrapper::initSemaphoreName() {
+  return "/NRV_RM_INIT_LIB_" + std::to_string(getpid());
+}
+
+std::string NRV_MethodWrapper::doneSemaphoreName() {
+  return "/NRV_RM_INIT_LIB_DONE_" + std::to_string(getpid());
+}
+
+NRV_MethodWrapper::NRV_MethodWrapper()
+    : m_SemName(initSemaphoreName()), m_DoneSemName(doneSemaphoreName()) {
+  NRV_LOG(NRV_DBG, "NRV_MethodWrapper::Constructor");
+  NRV_LOG(NRV_DBG, "Setting Up for FIFO.. ");
+  sem_t* sem = sem_open(m_SemName.c_str(), O_CREAT, 0644, 2);
+  if (sem == SEM_FAILED) {
+    NRV_LOG(NRV_DBG, "RM Library initialized");
+    return;
+  }
+  m_Sem = sem;
+  bool first = false;
+  {
+    std::lock_guard<std::mutex> lock(g_initMutex);
+    int value = 0;
+    sem_getvalue(m_Sem, &value);
+    first = value == 2;
+    waitOn(m_Sem);
+  }
+  if (first) {
+    NRV_LOG(NRV_DBG, "Aquired Semaphore.. Running RM_InitLib %s ", m_SemName.c_str());
+    sem_t* done = sem_open(m_DoneSemName.c_str(), O_CREAT, 0644, 0);
+    m_DoneSem = done == SEM_FAILED ? nullptr : done;
+    NRV_LOG(NRV_DBG, "Aquired Completed Semaphore.. Running RM_InitLib %s", m_DoneSemName.c_str());
+    const RM_STATUS status = LRM_InitLib();
+    if (static_cast<int>(status) > 0) {
+      NRV_LOG(NRV_CRIT, "Error : Initialization of RMLib:: RM_InitLib failed with[%d]",
+              static_cast<int>(status));
+      sem_post(m_Sem);
+      closeAndUnlink(m_Sem, m_SemName);
+      closeAndUnlink(m_DoneSem, m_DoneSemName);
+      throw std::runtime_error("RM_InitLib failed");
+    }
+    NRV_LOG(NRV_DBG, "Signalling Completed Semaphore.. Running RM_InitLib");
+    sem_post(m_Sem);
+    NRV_LOG(NRV_DBG, "Signaled Completed Semaphore.. Running RM_InitLib");
+  } else {
+    NRV_LOG(NRV_DBG, "Waiting on Completed Semaphore.. To issue RM Calls..%s.. sem = %p",
+            m_SemName.c_str(), static_cast<void*>(m_Sem));
+    waitOn(m_Sem);
+    NRV_LOG(NRV_DBG, "Recieved signal on Completed Semaphore.. To issue RM Calls");
+  }
+  NRV_LOG(NRV_DBG, "RM Library initialized");
+}
+
+NRV_MethodWrapper::~NRV_MethodWrapper() {
+  NRV_LOG(NRV_DBG, "NRV_MethodWrapper::Destructor");
+  if (m_Sem != nullptr) {
+    sem_post(m_Sem);
+    int value = 0;
+    sem_getvalue(m_Sem, &value);
+    NRV_LOG(NRV_DBG, "Value of Sem in destructor=%d", value);
+    closeAndUnlink(m_Sem, m_SemName);
+  }
+  // The completion semaphore would otherwise outlive the process in /dev/shm.
+  closeAndUnlink(m_DoneSem, m_DoneSemName);
+  NRV_LOG(NRV_DBG, "RM Library uninitialzed");
+}
+
+// ---- Adapter tests ------------------------------------------------------------
+
+int NRV_MethodWrapper::Validatewwpn(const HBA_NAME& name) {
+  NRV_LOG(NRV_DBG, "Entering NRV_MethodWrapper::Validatewwpn()");
+  HBA_UINT32 isLocal = 0;
+  const RM_STATUS status = RM_IsLocalHBA(name, &isLocal);
+  NRV_LOG(NRV_DBG, "RM_IsLocalHBA: status=%d", static_cast<int>(status));
+  if (status == RM_STATUS_SUCCESS && isLocal != 0) return 0;
+  NRV_LOG(NRV_ERR, "HBA IS NOT LOCAL");
+  return 1;
+}
+
+RM_STATUS NRV_MethodWrapper::HasFeature(const HBA_NAME& name, HBA_UINT32 feature, bool& available) {
+  HBA_UINT32 flag = 0;
+  const RM_STATUS status = LRM_GetHBAFeature(name, feature, &flag);
+  available = status == RM_STATUS_SUCCESS && flag == 1;
+  return status;
+}
+
+int NRV_MethodWrapper::IsTarnelCNA(const HBA_NAME& name) {
+  NRV_LOG(NRV_DBG, "NRV_MethodWrapper::IsTarnelCNA");
+  if (Validatewwpn(name) != 0) {
+    NRV_LOG(NRV_ERR, "INVALID wwpn");
+    return 0;
+  }
+  bool tarnel = false;
+  HasFeature(name, RM_FEATURE_TARNEL_CNA, tarnel);
+  if (!tarnel) return 0;
+  NRV_LOG(NRV_DBG, "Tarnel CNA Port ");
+  return 1;
+}
+
+RM_STATUS NRV_MethodWrapper::GetCNAType(const HBA_NAME& name, bool& isNicOnly, bool& isISCSI,
+                                        bool& isFCoE, bool& isRoCE) {
+  NRV_LOG(NRV_DBG, "Entering the GetCNAType");
+  isNicOnly = true;
+  isISCSI = isFCoE = isRoCE = false;
+  static const HBA_UINT32 kOrder[] = {RM_FEATURE_FCOE, RM_FEATURE_FCOE_ALT, RM_FEATURE_ISCSI,
+                                      RM_FEATURE_ISCSI_ALT, RM_FEATURE_ROCE};
+  RM_STATUS status = RM_STATUS_SUCCESS;
+  for (HBA_UINT32 feature : kOrder) {
+    bool has = false;
+    status = HasFeature(name, feature, has);
+    if (status != RM_STATUS_SUCCESS) {
+      NRV_LOG(NRV_ERR, "RM_GetHBAFeature call failed with %d", static_cast<int>(status));
+      isNicOnly = false;
+      return status;
+    }
+    if (!has) continue;
+    if (feature == RM_FEATURE_ISCSI || feature == RM_FEATURE_ISCSI_ALT) isISCSI = true;
+    if (feature == RM_FEATURE_FCOE || feature == RM_FEATURE_FCOE_ALT) isFCoE = true;
+    if (feature == RM_FEATURE_ROCE) isRoCE = true;
+    isNicOnly = false;
+    break;
+  }
+  NRV_LOG(NRV_DBG, "Exiting the GetCNAType");
+  return status;
+}
+
+void NRV_MethodWrapper::logStatus(RM_STATUS status) {
+  char text[RM_STATUS_STRING_SIZE] = {};
+  RM_StatusString(status, text, sizeof text);
+  text[sizeof text - 1] = '\0';
+  if (text[0] != '\0')
+    NRV_LOG(NRV_DBG, "Status: <%d>:%s", static_cast<int>(status), text);
+  else
+    NRV_LOG(NRV_DBG, "Status: <%d>", static_cast<int>(status));
+}
+
+// ---- Library information ----------------------------------------------------------
+
+namespace {
+template <class Fn>
+RM_STATUS readVersion(Fn fn, const char* what, std::string& version) {
+  char text[256] = {};
+  const RM_STATUS status = fn(text, sizeof text);
+  text[sizeof text - 1] = '\0';
+  if (status != RM_STATUS_SUCCESS) {
+    NRV_LOG(NRV_ERR, "%s failed with %d", what, static_cast<int>(status));
+    return status;
+  }
+  version = text;
+  return status;
+}
+}  // namespace
+
+RM_STATUS NRV_MethodWrapper::GetLibraryVersion(std::string& version) {
+  return readVersion(RM_GetVersion, "RM_GetVersion", version);
+}
+
+RM_STATUS NRV_MethodWrapper::GetTIROLibVersion(std::string& version) {
+  return readVersion(RM_TiroVersion, "RM_TiroVersion", version);
+}
+
+RM_STATUS NRV_MethodWrapper::SetTIROTraceLevel(HBA_UINT32 mask, HBA_UINT32 level) {
+  const RM_STATUS status = LRM_SetDebugTraces(mask, level);
+  if (status != RM_STATUS_SUCCESS) logStatus(status);
+  return status;
+}
+
+// ---- Simple adapter operations ------------------------------------------------------
+
+RM_STATUS NRV_MethodWrapper::nrvcimReset(const HBA_NAME& name) {
+  return validated(name, "nrvcimReset", [&] { return LRM_ResetHBA(name); });
+}
+
+RM_STATUS NRV_MethodWrapper::nrvcimGetRetentionCount(const HBA_NAME& name, HBA_UINT32& count) {
+  return validated(name, "nrvcimGetRetentionCount",
+                   [&] { return LRM_GetDumpRetentionCount(name, &count); });
+}
+
+RM_STATUS NRV_MethodWrapper::SetRetentionCount(const HBA_NAME& name, HBA_UINT32 count) {
+  return validated(name, "SetRetentionCount", [&] { return LRM_SetDumpRetentionCount(name, count); });
+}
+
+RM_STATUS NRV_MethodWrapper::nrvcimDeleteDumpFiles(const HBA_NAME& name) {
+  return validated(name, "nrvcimDeleteDumpFiles", [&] { return LRM_DeleteDumpFiles(name); });
+}
+
+RM_STATUS NRV_MethodWrapper::nrvcimGetDumpDirectory(const HBA_NAME& name, std::string& directory) {
+  return validated(name, "nrvcimGetDumpDirectory", [&] {
+    char text[256] = {};
+    const RM_STATUS status = LRM_GetDumpDirectoryA(name, text, sizeof text);
+    text[sizeof text - 1] = '\0';
+    if (status == RM_STATUS_SUCCESS) directory = text;
+    return status;
+  });
+}
+
+RM_STATUS NRV_MethodWrapper::SetPortEnabled(const HBA_NAME& name, HBA_UINT32 enabled,
+                                            HBA_UINT8& configStatus) {
+  return validated(name, "SetPortEnabled",
+                   [&] { return LRM_SetPortEnabled(name, enabled, &configStatus); });
+}
+
+RM_STATUS NRV_MethodWrapper::SetCableNVP(const HBA_NAME& name, HBA_UINT32 nvp) {
+  return validated(name, "SetCableNVP", [&] { return LRM_DiagSetNVP(name, nvp); });
+}
+
+RM_STATUS NRV_MethodWrapper::SetiSCSIBoot(const HBA_NAME& name, HBA_UINT32 enabled) {
+  return validated(name, "SetiSCSIBoot", [&] {
+    return LRM_SetAdapterAttribute(name, RM_PA_ISCSI_BOOT_ENABLED, &enabled, sizeof enabled);
+  });
+}
+
+}  // namespace cimple
