@@ -43,10 +43,12 @@ class LogCapture : public cimple::NRV_LoggerInterface {
     return n;
   }
   // Number of messages beginning with `prefix` that also contain `needle`.
-  int count(const std::string& prefix, const std::string& needle) const {
+  int count(const std::string& prefix, const std::string& needle, int level = -1) const {
     int n = 0;
     for (const Entry& e : entries())
-      if (e.message.rfind(prefix, 0) == 0 && e.message.find(needle) != std::string::npos) ++n;
+      if (e.message.rfind(prefix, 0) == 0 && e.message.find(needle) != std::string::npos &&
+          (level < 0 || e.level == level))
+        ++n;
     return n;
   }
   bool contains(const std::string& text) const {
