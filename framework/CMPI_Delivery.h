@@ -1,0 +1,56 @@
+// How the CMPI adapter hands provider results to the CIMOM: the enumeration
+// handlers that turn each delivered instance into an object path or a CMPI
+// instance (or fetch it from the CIMOM), and the mapping of provider result
+// codes to CMPI return codes.
+//
+// Contract: a handler owns each instance it receives and releases every CMPI
+// object it creates right after returning it, so an enumeration holds one
+// object at a time.  A conversion failure stops further delivery and is kept
+// in `error`; it does not change the operation's return code.
+#pragma once
+
+#include <initializer_list>
+#include <memory>
+#include <string>
+
+#include "framework/Converter.h"
+
+namespace cimple {
+
+struct Instance_Unref {
+  void operator()(Instance* instance) const { unref(instance); }
+};
+using Instance_Ptr = std::unique_ptr<Instance, Instance_Unref>;
+
+struct CMPI_Delivery {
+  const CMPIBroker* broker;
+  const CMPIContext* context;
+  const CMPIResult* result;
+  const char* name_space;               // the request's
+  const char* const* properties;        // null: all
+  bool own_name_space = false;          // prefer the instance's own name space
+  bool apply_list = false;              // apply the list (keys too) before converting
+  CMPIrc error = CMPI_RC_OK;
+
+  const char* name_space_for(const Instance* instance) const {
+    return own_name_space && !instance->__name_space.empty() ? instance->__name_space.c_str() : name_space;
+  }
+};
+
+// Handler procedures (Handler_Proc); `data` is a CMPI_Delivery.
+bool deliver_object_path(Instance* instance, int status, void* data);
+bool deliver_instance(Instance* instance, int status, void* data);
+// Fetches each delivered object from the CIMOM (getInstance with the list)
+// and returns what it gets; a failed fetch stops the walk.
+bool deliver_fetched_instance(Instance* instance, int status, void* data);
+
+struct Result_Map {
+  int result;
+  CMPIrc rc;
+};
+CMPIrc map_result(int result, std::initializer_list<Result_Map> table, CMPIrc otherwise);
+
+// The name space of an object path ("" when it has none).
+std::string name_space_of(const CMPIObjectPath* path);
+
+}  // namespace cimple
