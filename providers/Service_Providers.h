@@ -3,3 +3,4 @@
 #pragma once
 
 #include "framework/module/Provider_For.h"
+#include "agent/NRVTAVO_ProviderConfigSetting_Provider.h"

@@ -1,0 +1,201 @@
+// Life cycle of the agent: the process-wide pointer and reference count,
+// construction and destruction in their fixed order.  The data fetch lives in
+// ProviderAgent_Fetch.cpp, the clearing of the maps in ProviderAgent_Clear.cpp.
+#include "agent/ProviderAgent.h"
+
+#include <unistd.h>
+
+#include <exception>
+
+#include "access/NRV_Common.h"
+#include "access/NRV_MethodWrapper.h"
+#include "access/NRV_Runtime_Loader.h"
+#include "access/NRV_SystemPaths.h"
+#include "access/RM_Api.h"
+#include "data/NRV_Data.h"
+#include "logging/CLogger.h"
+#include "logging/Log.h"
+#include "schema/Classes.h"
+
+namespace cimple {
+
+namespace {
+
+// The process-wide state: the agent pointer, its reference count and the
+// agent mutex, which guards both (the pointer is also read without it).
+std::atomic<ProviderAgent*> s_pAgent{nullptr};
+int32_t s_RefCount = 0;
+std::mutex s_AgentMutex;
+Catalogue_Builders s_Builders = ProviderAgent::defaultBuilders();  // guarded by s_AgentMutex
+
+void default_build_adapter_data(ProviderAgent& agent) {
+  if (agent.m_pData) agent.m_pData->buildAdapterData();
+}
+void default_update_adapter_maps(ProviderAgent& agent) { agent.updateAdapterMaps(); }
+void default_build_san_data(ProviderAgent& agent) {
+  if (agent.m_pData) agent.m_pData->buildSANData();
+}
+void default_update_san_maps(ProviderAgent& agent) { agent.updateSANMaps(); }
+// Diagnostic jobs have no clean-up of their own yet; the map releases them.
+void default_release_diagnostic_jobs(ProviderAgent&) {}
+
+}  // namespace
+
+Catalogue_Builders ProviderAgent::defaultBuilders() {
+  return {default_build_adapter_data, default_update_adapter_maps, default_build_san_data,
+          default_update_san_maps, default_release_diagnostic_jobs};
+}
+
+void ProviderAgent::useBuilders(const Catalogue_Builders& builders) {
+  std::lock_guard<std::mutex> lock(s_AgentMutex);
+  s_Builders = builders;
+}
+
+ProviderAgent* ProviderAgent::getInstance() {
+  if (ProviderAgent* agent = s_pAgent.load(std::memory_order_acquire)) return agent;
+  std::lock_guard<std::mutex> lock(s_AgentMutex);
+  ProviderAgent* agent = s_pAgent.load(std::memory_order_relaxed);
+  if (agent == nullptr) {
+    agent = new ProviderAgent(s_Builders);
+    s_pAgent.store(agent, std::memory_order_release);
+  }
+  return agent;
+}
+
+ProviderAgent* ProviderAgent::peekInstance() { return s_pAgent.load(std::memory_order_acquire); }
+
+int32_t ProviderAgent::refCount() {
+  std::lock_guard<std::mutex> lock(s_AgentMutex);
+  return s_RefCount;
+}
+
+void ProviderAgent::addRef() {
+  NRV_LOG(NRV_DBG, "ProviderAgent::addRef[%d]", refCount());
+  std::lock_guard<std::mutex> lock(s_AgentMutex);
+  ++s_RefCount;
+}
+
+void ProviderAgent::releaseRef() {
+  NRV_LOG(NRV_DBG, "ProviderAgent::releaseRef[%d]", refCount());
+  std::lock_guard<std::mutex> lock(s_AgentMutex);
+  if (s_RefCount == 0) return;
+  if (--s_RefCount > 0) return;
+  // Destroyed under the agent mutex, so a provider loading meanwhile waits
+  // for the old agent (sinks, libraries) to be gone before a new one starts.
+  ProviderAgent* agent = s_pAgent.exchange(nullptr, std::memory_order_acq_rel);
+  delete agent;
+}
+
+// ---- construction ------------------------------------------------------------
+
+#define NRV_AGENT_INIT_MAP(C) , m_##C##_map(&C::static_meta_class)
+
+ProviderAgent::ProviderAgent(const Catalogue_Builders& builders)
+    : m_FileLogger(CLogger::instance()),
+      m_CIMLogger(CLogger::instance(), NRV_CIMLogger::kDefaultMaxRecords),
+      m_CIM_ComputerSystem_map(&CIM_ComputerSystem::static_meta_class),
+      m_CIM_Chassis_map(&CIM_Chassis::static_meta_class)
+      NRV_FOR_EACH_PROVIDER_CLASS(NRV_AGENT_INIT_MAP),
+      m_Builders(builders) {
+  construct();
+}
+
+#undef NRV_AGENT_INIT_MAP
+
+void ProviderAgent::construct() {
+  CLogger& logger = CLogger::instance();
+  logger.registerSink(&m_FileLogger);
+  logger.registerSink(&m_CIMLogger);
+  m_SysLogger.emplace(logger);
+  try {
+    m_ConfigFile.read(system_path(kNrvConfigFile));
+
+    logger.dataFile().setReadOnlyRootProbe([] { return IsReadOnlyFS(); });
+    logger.readConfigDataFile();
+    m_bLoggerDefault = logger.dataFile().applyDefaultIfMissing();
+
+    const NrvConfigFile::Settings settings = m_ConfigFile.settings();
+    m_CacheTimeout = settings.cacheTimeout;
+    m_bRefreshAdapterData = settings.refreshAdapterData;
+    m_bRefreshSANData = settings.refreshSANData;
+
+    if (getOSInformation(m_OSName, m_OSDistribution) != 0) NRV_LOG(NRV_ERR, "getOSInformation() failed");
+    {
+      std::lock_guard<std::mutex> lock(m_BuildMutex);
+      m_LoadedTime = Datetime();
+    }
+
+    NRV_LOG(NRV_DBG, "Initializing RM API ");
+    if (NRV_Runtime_Loader::loadLibraries() == 1) NRV_LOG(NRV_ERR, "Error : In Loading Library ");
+
+    m_pMethodWrapper = std::make_unique<NRV_MethodWrapper>();
+    m_pData = std::make_unique<Data>();
+
+    NRV_LOG(NRV_INFO, "Norvane Provider v%d.%d.%d-%d Loaded[%d]", kNrvVersion[0], kNrvVersion[1], kNrvVersion[2],
+            kNrvVersion[3], static_cast<int>(::getpid()));
+    m_bIsLoaded = true;
+  } catch (...) {
+    NRV_LOG(NRV_ERR, "Norvane CIM Provider load failure");
+    m_bIsLoaded = false;
+  }
+}
+
+// ---- destruction -------------------------------------------------------------
+
+ProviderAgent::~ProviderAgent() { destruct(); }
+
+void ProviderAgent::destruct() {
+  NRV_LOG(NRV_DBG, "Entering dtor ~ProviderAgent()");
+  try {
+    {
+      std::lock_guard<std::mutex> lock(m_BuildMutex);
+      m_bIsLoaded = false;
+      // A fetch that is running, or one that finished but was never joined,
+      // is joined here.  Not under m_BuildMutex: the fetch thread takes it
+      // last thing before it ends.
+      if (m_bIsDataFetchRunning) NRV_LOG(NRV_DBG, "PERF: Clearing the previous thread...with join");
+    }
+    if (m_DataFetchThread.joinable()) {
+      void* result = nullptr;
+      Thread::join(m_DataFetchThread, result);
+    }
+
+    NRV_LOG(NRV_DBG, "Deleting Data pointer");
+    {
+      std::unique_lock<std::mutex> data_ready(m_AdapterDataReadyMutex);
+      if (m_bIsAdapterDataBuilding) {
+        NRV_LOG(NRV_DBG, "PERF: Waiting for m_bIsAdapterDataReady");
+        m_AdapterDataReadyCond.wait(data_ready, [this] { return !m_bIsAdapterDataBuilding; });
+        NRV_LOG(NRV_DBG, "PERF: Woken up from wait for m_bIsAdapterDataReady");
+      }
+      std::unique_lock<std::mutex> maps_ready(m_AdapterMapsReadyMutex);
+      m_AdapterMapsReadyCond.wait(maps_ready, [this] { return !m_bIsAdapterMapsUpdating; });
+      std::lock_guard<std::recursive_mutex> data(m_DataMutex);
+
+      m_pData.reset();
+      NRV_LOG(NRV_DBG, "MethodWrapper");
+      m_pMethodWrapper.reset();
+
+      NRV_LOG(NRV_DBG, "Clearing the ConcreteJob objects related to CDM");
+      runStep(m_Builders.release_diagnostic_jobs, "release_diagnostic_jobs");
+      NRV_LOG(NRV_DBG, "Clearing all the record logs");
+      m_NRVTAVO_DiagnosticServiceRecord_map.clear();
+      m_NRVTAVO_DiagnosticCompletionRecord_map.clear();
+      m_NRVTAVO_RecordAppliesToElement_map.clear();
+      m_NRVTAVO_LogManagesRecord_map.clear();
+    }
+
+    DOZER_FreeLibrary();
+    ClearMaps();
+    if (!m_bLoggerDefault) CLogger::instance().writeConfigDataFile();
+
+    NRV_LOG(NRV_INFO, "Norvane Provider Unloaded");
+    NRV_Runtime_Loader::unloadLibraries();
+    CLogger::instance().unregisterAll();
+  } catch (...) {
+    NRV_LOG(NRV_ERR, "Error in ProviderAgent unload. Just continue");
+  }
+  // The members die next; the configuration rewrites its file as it goes.
+}
+
+}  // namespace cimple
