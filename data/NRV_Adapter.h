@@ -70,7 +70,8 @@ class Adapter {
   template <class Attributes, class Statistics, class PortType>
   void build(const RM_LOCAL_HBA_INFO_V4& info);
 
-  void setHbaApiName(std::string name) { m_HbaApiName = std::move(name); }
+  // Looks the adapter up in the HBA API by its identifier (FC and FCoE).
+  void findHbaApiName();
 
  private:
   const AdapterKind& m_Kind;

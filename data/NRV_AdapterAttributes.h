@@ -12,13 +12,25 @@
 
 namespace cimple {
 
+// Label of the FCoE set's driver type (RM_GetDriverType).
+inline constexpr const char* kAttrDriverType = "_DriverType";
+
 class AdapterAttributes : public AttributeSet {
  public:
+  // The member lists a set reads (FC sets read the FCoE lists).
+  enum class Kind { kNic, kIscsi, kFcoe };
+
   // 1 once the blob was read, else 0: the number of ports the adapter builds.
   uint32_t getNumberOfPorts() const { return m_NumberOfPorts; }
 
  protected:
   AdapterAttributes() = default;
+
+  // Reads the HBA attribute blob of the adapter named by `identifierText`
+  // into the members of `kind` (FC adapters read the FCoE members).
+  void fill(Kind kind, const std::string& identifierText);
+
+ private:
   uint32_t m_NumberOfPorts = 0;
 };
 

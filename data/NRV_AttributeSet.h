@@ -41,8 +41,28 @@ class AttributeSet {
   };
   const std::vector<Member>& members() const { return m_Members; }
 
+  // How a member is read out of a blob, and which failure text it logs.
+  enum class Scope : uint8_t { kAdapter, kPort };
+  enum class Type : uint8_t {
+    kInteger,      // 32-bit
+    kServiceType,  // 32-bit, also logged as "PA_PORT_SERVICE_TYPE"
+    kText,         // at most 255 bytes
+    kMac,          // 6 bytes, written as lower-case pairs joined by ":"
+    kWwn,          // 8 bytes, written as 16 upper-case hex digits
+    kFabric,       // RM_FABRIC_RECORD: "_FabricName" and "_nFlags"
+  };
+  struct Field {
+    uint16_t number;
+    Type type;
+    const char* label;
+  };
+
  protected:
   AttributeSet() = default;
+
+  // Reads every field out of `blob` (RM_GetAttributeValue), logging each
+  // value or failure; a failed read leaves its member at 0 / "".
+  void readFields(void* blob, Scope scope, const std::vector<Field>& fields);
 
   // Adds (or overwrites) a member that does not come from the blob.
   void setText(const char* label, std::string value);

@@ -48,9 +48,10 @@ class Data {
   bool hasIscsiAdapter() const { return m_HasIscsiAdapter; }
 
  private:
-  // One enumeration pass; sets *nicSeen when a pass ends at the first NIC
-  // function of a scanning pass.
-  void enumeratePass(bool* nicSeen);
+  // One enumeration pass with a list of *capacity entries (grown when the
+  // library asks).  A scanning pass (*nicSeen false) ends at the first NIC
+  // function and sets *nicSeen; a building pass creates the adapters.
+  void enumeratePass(HBA_UINT32* capacity, bool* nicSeen);
   void createAdapter(uint32_t index, const RM_LOCAL_HBA_INFO_V4& info);
 
   std::vector<std::unique_ptr<Adapter>> m_Adapters;

@@ -11,6 +11,7 @@
 
 #include <stdint.h>
 
+#include <functional>
 #include <memory>
 #include <string>
 #include <vector>
@@ -55,10 +56,13 @@ class Port {
   const std::string& getSecondaryName() const { return m_SecondaryName; }
 
  protected:
+  // Logs the kind's construction text, then reads the attribute set.
   Port(const PortKind& kind, Adapter& adapter, uint32_t index,
-       std::unique_ptr<PortAttributes> attributes, const char* secondaryLabel);
+       const std::function<std::unique_ptr<PortAttributes>()>& readAttributes);
 
  private:
+  void freeTargets();
+
   const PortKind& m_Kind;
   std::string m_PortName;
   uint32_t m_PortIndex;

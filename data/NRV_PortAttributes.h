@@ -23,24 +23,33 @@ inline constexpr const char* kAttrPortWWN = "_PortWWN";
 inline constexpr const char* kAttrFabricName = "_FabricName";
 inline constexpr const char* kAttrFabricFlags = "_nFlags";
 inline constexpr const char* kAttrSpecialFeature = "_SpecialFeature";
-inline constexpr const char* kAttrIPAddress = "_IPAddress";
-inline constexpr const char* kAttrSubnetMask = "_SubnetMask";
-inline constexpr const char* kAttrGateway = "_Gateway";
-inline constexpr const char* kAttrVLANId = "_VLANId";
-inline constexpr const char* kAttrVLANEnabled = "_VLANEnabled";
+inline constexpr const char* kAttrNetIPAddress = "_NetIPAddress";
+inline constexpr const char* kAttrNetSubnetMask = "_NetSubnetMask";
+inline constexpr const char* kAttrNetGateway = "_NetGateway";
+inline constexpr const char* kAttrNetVLANId = "_NetVLANId";
+inline constexpr const char* kAttrNetVLANEnabled = "_NetVLANEnabled";
 inline constexpr const char* kAttrInitiatorName = "_InitiatorName";
 inline constexpr const char* kAttrInitiatorAlias = "_InitiatorAlias";
 inline constexpr const char* kAttrAuthMethod = "_AuthMethod";
 inline constexpr const char* kAttrCHAPName = "_CHAPName";
-inline constexpr const char* kAttrDriverType = "_DriverType";
 
 class PortAttributes : public AttributeSet {
  public:
+  // The member lists a set reads (FC sets read the FCoE lists).
+  enum class Kind { kNic, kIscsi, kFcoe };
+
   // The port identifier text ("_WWPN").
   const std::string& getPortIdentifier() const { return text(kAttrPortIdentifier); }
 
  protected:
-  explicit PortAttributes(const std::string& identifierText);
+  PortAttributes() = default;
+
+  // Reads the port records of the port named by `identifierText` into the
+  // members of `kind` (FC ports read the FCoE members); `info` only for NIC.
+  void fill(Kind kind, const std::string& identifierText, const RM_LOCAL_HBA_INFO_V4* info);
+
+ private:
+  void readIscsiRecords(const HBA_NAME& name);
 };
 
 class FCPortAttributes : public PortAttributes {
