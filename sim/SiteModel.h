@@ -1,0 +1,202 @@
+// The simulated hardware: cards, their PCI functions, the SAN behind them and
+// the management library's own settings.  Plain data; SiteLoader fills it and
+// the library entry points read and change it under SimSite's lock.
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <map>
+#include <string>
+#include <utility>
+#include <variant>
+#include <vector>
+
+#include "sim/Names.h"
+
+namespace nrvsim {
+
+enum class Kind : uint8_t { kNic, kIscsi, kFcoe };
+
+// Protocol mask bits of the adapter information record.
+inline constexpr uint32_t kMaskIscsi = 0x04;
+inline constexpr uint32_t kMaskNic = 0x08;
+inline constexpr uint32_t kMaskFcoe = 0x10;
+
+// A value put straight into an attribute blob by number (site overrides).
+using AttrValue = std::variant<uint32_t, uint64_t, std::string>;
+using AttrMap = std::map<uint16_t, AttrValue>;
+
+// (keyword, value) in the order the card's EEPROM lists them.
+using VpdEntries = std::vector<std::pair<std::string, std::string>>;
+
+struct ScsiUnit {  // one logical unit, FC or iSCSI
+  uint32_t lun = 0;
+  uint8_t device_type = 0;  // SCSI peripheral device type
+  std::string vendor, product, revision, serial;
+  std::vector<uint8_t> naa;  // page 0x83 designator (NAA), 8 or 16 bytes
+  uint64_t blocks = 0;       // number of logical blocks
+  uint32_t block_size = 512;
+  std::string os_device;
+  bool oas = false;  // optimized-access state
+};
+
+struct FcTarget {
+  Wwn wwpn{}, wwnn{};
+  uint32_t fc_id = 0;
+  uint32_t scsi_target = 0;
+  std::vector<ScsiUnit> luns;
+};
+
+struct VPort {
+  Wwn wwpn{}, wwnn{};
+  uint32_t fc_id = 0;
+  std::string name;
+  std::string vm_name;
+  uint32_t state = 1;
+};
+
+struct Endpoint {  // IP address and TCP port as text and number
+  std::string ip;
+  uint16_t port = 0;
+};
+
+struct IscsiConnection {
+  uint16_t cid = 0;
+  Endpoint local, remote;
+};
+
+struct IscsiSession {
+  uint32_t id = 0;  // library handle, unique within the site
+  uint64_t isid = 0;
+  uint16_t tsih = 0;
+  uint32_t state = 0;  // 0 open, 1 closed, ...
+  std::vector<IscsiConnection> connections;
+};
+
+struct IscsiTarget {
+  std::string name, alias;
+  Endpoint portal;
+  uint32_t auth_method = 0;  // 0 none, 1 one-way CHAP, 2 mutual
+  std::string chap_name;
+  bool boot = false;
+  std::vector<IscsiSession> sessions;
+  std::vector<ScsiUnit> luns;
+};
+
+struct IscsiInitiator {
+  std::string name, alias;
+  uint32_t auth_method = 0;
+  std::string chap_name;
+  std::vector<Endpoint> portals;  // send-target portals
+  std::vector<Endpoint> isns;
+  bool isns_enabled = false;
+};
+
+struct IpConfig {
+  std::string address, netmask, gateway, ipv6_gateway;
+  bool dhcp = false;
+  uint16_t vlan = 0;
+};
+
+struct ArpEntry {
+  std::string ip;
+  Mac mac{};
+};
+
+struct RouteEntry {
+  std::string destination, netmask, gateway;
+};
+
+struct DriverParam {
+  std::string name, help;
+  uint32_t min = 0, max = 0, def = 0, current = 0;
+  uint32_t exported = 1, changeable = 1;
+};
+
+struct SffData {
+  bool present = false, diagnostics = false;
+  uint8_t identifier = 3, ext_identifier = 4, connector = 7;
+  uint16_t wavelength = 850;
+  std::string vendor, part_number, revision, serial, date_code;
+  std::array<uint8_t, 3> oui{};
+  float temperature = 0, vcc = 0, tx_bias = 0, tx_power = 0, rx_power = 0;
+  // high alarm, low alarm, high warning, low warning; raw SFF-8472 units
+  std::array<uint16_t, 4> temp_thresholds{}, vcc_thresholds{}, bias_thresholds{}, tx_thresholds{},
+      rx_thresholds{};
+};
+
+struct PhysicalPort {
+  bool link_up = true;
+  uint32_t speed_mbps = 10000;
+  uint32_t max_speed_mbps = 10000;
+  uint32_t link_down_reason = 0;
+  bool enabled = true;
+  bool beacon = false;
+  bool is_10gbaset = false;
+  SffData sff;
+};
+
+// One PCI function: what the management library calls a local HBA.
+struct Function {
+  Kind kind = Kind::kNic;
+  uint32_t instance = 0;  // management-library instance number
+  uint32_t port = 0;      // index into Card::ports
+  uint16_t pci_function = 0;
+  Wwn id{};               // identifier the library addresses it by
+  Wwn wwnn{};             // FCoE only
+  Wwn factory_id{}, factory_wwnn{};  // restored by RestoreWWN
+  Wwn nv_id{}, nv_wwnn{};             // non-volatile (configured) names
+  bool volatile_names = false;        // a volatile WWN change is in force
+  Mac mac{};
+  std::string ifname;
+  uint32_t mtu = 1500;
+  IpConfig ip;
+  std::string driver_name, driver_version;
+  uint32_t driver_type = 0;
+  uint32_t fc_id = 0;
+  Wwn fabric{};
+  AttrMap hba_overrides, port_overrides;
+  std::map<uint16_t, uint64_t> statistics;
+  std::vector<FcTarget> fc_targets;
+  std::vector<VPort> vports;
+  std::vector<DriverParam> driver_params;
+  std::vector<ArpEntry> arp;
+  std::vector<RouteEntry> routes;
+  IscsiInitiator initiator;
+  std::vector<IscsiTarget> iscsi_targets;
+  std::string hba_name;  // HBA API adapter name (FCoE), set by the loader
+};
+
+struct Firmware {
+  std::string operational, flash, boot, option_rom, ulp, sp, ncsi, ipl_file, uefi;
+};
+
+struct Card {
+  std::string model, description, manufacturer = "Norvane", serial, hardware_version;
+  std::string sub_adapter;
+  uint32_t pci_bus = 0;
+  uint32_t vendor_id = 0x1C7E, device_id = 0, sub_vendor_id = 0, sub_device_id = 0;
+  int32_t temperature = 45, warning_temp = 85, critical_temp = 100;
+  Firmware firmware;
+  VpdEntries vpd, fru;
+  std::vector<uint32_t> features;
+  std::vector<PhysicalPort> ports;
+  std::vector<Function> functions;
+};
+
+struct LibraryInfo {
+  std::string version = "12.8.351.29";
+  std::string tiro_version = "4.2.11";
+  uint32_t init_status = 0;
+  std::vector<DriverParam> global_driver_params;
+  std::string dump_directory = "/var/crash/norvane";
+  uint32_t dump_retention = 10;
+};
+
+struct Site {
+  LibraryInfo library;
+  std::vector<Card> cards;
+  uint32_t next_session_id = 1;
+};
+
+}  // namespace nrvsim
