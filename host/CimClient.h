@@ -1,0 +1,31 @@
+// CimClient: the nrv-cim command line — a wbemcli-like client that runs CIM operations against
+// a provider module loaded into an in-process Host.
+//
+//   nrv-cim [options] <op> <path> [Name=value ...]
+//   ops: ei ein gi ai ain ri rin ci mi di cm
+//   options: -m <module>, -p <prop,prop>, -ac|--assoc-class <C>, -rc|--result-class <C>,
+//            -r|--role <R>, -rr|--result-role <R>
+//
+// Contract: runCimClient never throws and never exits the process; it writes results to `out`,
+// errors to `err` and returns the exit status: 0 success, 1 failed CIM call (the line
+// "CMPI_RC_ERR_... : message"), 2 malformed path, argument or usage (one line).
+#ifndef NRV_HOST_CIMCLIENT_H
+#define NRV_HOST_CIMCLIENT_H
+
+#include <ostream>
+#include <string>
+#include <vector>
+
+#include "host/Datum.h"
+
+namespace nrv::host {
+
+int runCimClient(const std::vector<std::string>& args, std::ostream& out, std::ostream& err);
+
+// The MOF-like text of one instance: "instance of C {", one "    P = v;" line per property,
+// "};".
+std::string formatInstance(const InstanceData& instance);
+
+}  // namespace nrv::host
+
+#endif  // NRV_HOST_CIMCLIENT_H

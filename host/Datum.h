@@ -1,0 +1,102 @@
+// Datum: the host's own value model behind every CMPI object it hands out — typed values,
+// object paths, instances and arrays held as plain C++ data, shared immutably between copies.
+//
+// Contract: a Datum is a value; copying it never copies referenced paths, instances or arrays
+// (they are shared, read-only). Nothing here touches CMPI handles; conversion to and from CMPI
+// lives in CmpiConvert.h.
+#ifndef NRV_HOST_DATUM_H
+#define NRV_HOST_DATUM_H
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "cmpidt.h"
+
+namespace nrv::host {
+
+struct PathData;
+struct InstanceData;
+struct ArrayData;
+
+// A CIM datetime: a point in time (microseconds since 1970-01-01 UTC, plus the UTC offset it was
+// written with) or an interval (microseconds).
+struct DateTimeValue {
+  CMPIUint64 micros = 0;
+  bool interval = false;
+  int utcOffsetMinutes = 0;
+
+  // The 25-character CIM form, "yyyymmddhhmmss.mmmmmm+ooo" or "ddddddddhhmmss.mmmmmm:000".
+  std::string text() const;
+  static std::optional<DateTimeValue> parse(const std::string& text);
+  static DateTimeValue now();
+};
+
+struct Datum {
+  CMPIType type = CMPI_null;   // CMPI type code; CMPI_ARRAY is set for arrays
+  bool isNull = true;
+  CMPIValue scalar{};          // numbers, boolean, char16, raw data pointer
+  std::string text;            // CMPI_string
+  DateTimeValue dateTime;      // CMPI_dateTime
+  std::shared_ptr<const PathData> path;          // CMPI_ref
+  std::shared_ptr<const InstanceData> instance;  // CMPI_instance
+  std::shared_ptr<const ArrayData> array;        // arrays
+
+  static Datum null(CMPIType type);
+  static Datum string(std::string value);
+  static Datum boolean(bool value);
+  static Datum unsignedInt(CMPIType type, CMPIUint64 value);
+  static Datum signedInt(CMPIType type, CMPISint64 value);
+  static Datum real(CMPIType type, double value);
+  static Datum reference(PathData value);
+  static Datum embedded(InstanceData value);
+  static Datum time(DateTimeValue value);
+  static Datum arrayOf(CMPIType elementType, std::vector<Datum> elements);
+
+  bool isArray() const { return (type & CMPI_ARRAY) != 0; }
+  // Integer view of any integer type (for tests and printing).
+  CMPISint64 asInteger() const;
+  bool operator==(const Datum& other) const;
+};
+
+using NamedData = std::vector<std::pair<std::string, Datum>>;
+
+// CIM names compare case-insensitively.
+bool sameName(const std::string& a, const std::string& b);
+const Datum* findNamed(const NamedData& list, const std::string& name);
+// Replaces an entry of the same name in place, else appends.
+void setNamed(NamedData& list, const std::string& name, Datum value);
+
+struct PathData {
+  std::string nameSpace;
+  std::string host;
+  std::string className;
+  NamedData keys;
+  bool operator==(const PathData& other) const;
+};
+
+struct InstanceData {
+  PathData path;
+  NamedData properties;
+  // Property filter set through setPropertyFilter: names outside it are dropped on set.
+  std::optional<std::vector<std::string>> filter;
+  std::vector<std::string> filterKeys;
+
+  bool admits(const std::string& name) const;
+};
+
+struct ArrayData {
+  CMPIType elementType = CMPI_null;
+  std::vector<Datum> elements;
+};
+
+// "uint16", "string[]", ... for a CMPI type code; "unknown" for codes outside the standard.
+std::string typeName(CMPIType type);
+std::optional<CMPIType> typeFromName(const std::string& name);
+
+}  // namespace nrv::host
+
+#endif  // NRV_HOST_DATUM_H

@@ -1,0 +1,154 @@
+// EncObjects: the host broker's CMPI encapsulated objects (string, datetime, array, object path,
+// instance, args, context, enumeration, result) and their constructors.
+//
+// Contract: every make*() registers the new object with the ObjectRegistry (current arena unless
+// `detached`) and returns the CMPI handle; `owner` is the broker on whose behalf it is made and is
+// only used to free leftovers at shutdown. All function-table entries validate their handles
+// through the registry and answer CMPI status codes for bad calls.
+#ifndef NRV_HOST_ENCOBJECTS_H
+#define NRV_HOST_ENCOBJECTS_H
+
+#include <memory>
+#include <mutex>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "cmpift.h"
+#include "host/Datum.h"
+#include "host/ObjectRegistry.h"
+
+namespace nrv::host {
+
+// Helpers shared by the function tables.
+inline CMPIStatus makeStatus(CMPIrc rc) { return CMPIStatus{rc, nullptr}; }
+inline void setStatus(CMPIStatus* st, CMPIrc rc) {
+  if (st != nullptr) {
+    st->rc = rc;
+    st->msg = nullptr;
+  }
+}
+inline CMPIData badData(CMPIValueState state = CMPI_badValue) {
+  CMPIData d{};
+  d.type = CMPI_null;
+  d.state = state;
+  return d;
+}
+
+template <typename CmpiT, typename FtT, EncKind K>
+class EncBase : public EncObject {
+ public:
+  static constexpr EncKind kKind = K;
+  EncKind kind() const override { return K; }
+  const void* handle() const override { return &cmpi_; }
+  CmpiT* cmpi() { return &cmpi_; }
+
+ protected:
+  EncBase(const void* owner, const FtT* ft) : EncObject(owner) {
+    cmpi_.hdl = this;
+    cmpi_.ft = ft;
+  }
+  CmpiT cmpi_{};
+};
+
+class EncString : public EncBase<CMPIString, CMPIStringFT, EncKind::String> {
+ public:
+  EncString(const void* owner, std::string text);
+  const std::string& text() const { return text_; }
+
+ private:
+  const std::string text_;
+};
+
+class EncDateTime : public EncBase<CMPIDateTime, CMPIDateTimeFT, EncKind::DateTime> {
+ public:
+  EncDateTime(const void* owner, DateTimeValue value);
+  const DateTimeValue value;
+};
+
+class EncArray : public EncBase<CMPIArray, CMPIArrayFT, EncKind::Array> {
+ public:
+  EncArray(const void* owner, ArrayData data);
+  ArrayData data;
+};
+
+class EncObjectPath : public EncBase<CMPIObjectPath, CMPIObjectPathFT, EncKind::ObjectPath> {
+ public:
+  EncObjectPath(const void* owner, PathData data);
+  PathData data;
+};
+
+class EncInstance : public EncBase<CMPIInstance, CMPIInstanceFT, EncKind::Instance> {
+ public:
+  EncInstance(const void* owner, InstanceData data);
+  InstanceData data;
+};
+
+class EncArgs : public EncBase<CMPIArgs, CMPIArgsFT, EncKind::Args> {
+ public:
+  EncArgs(const void* owner, NamedData data);
+  NamedData data;
+};
+
+class EncContext : public EncBase<CMPIContext, CMPIContextFT, EncKind::Context> {
+ public:
+  EncContext(const void* owner, NamedData data, bool prepared);
+  NamedData data;
+  // Made by prepareAttachThread: detachThread releases it.
+  const bool prepared;
+};
+
+class EncEnumeration : public EncBase<CMPIEnumeration, CMPIEnumerationFT, EncKind::Enumeration> {
+ public:
+  EncEnumeration(const void* owner, std::vector<Datum> items);
+  std::vector<Datum> items;
+  std::size_t next = 0;
+};
+
+// What an MI delivered through a CMPIResult; shared between the result object and the caller.
+struct ResultSink {
+  std::mutex mu;
+  std::vector<Datum> items;
+  bool done = false;
+};
+
+class EncResult : public EncBase<CMPIResult, CMPIResultFT, EncKind::Result> {
+ public:
+  EncResult(const void* owner, std::shared_ptr<ResultSink> sink);
+  const std::shared_ptr<ResultSink> sink;
+};
+
+// Constructors; see the contract above.
+CMPIString* makeString(const void* owner, std::string text, bool detached = false);
+CMPIDateTime* makeDateTime(const void* owner, DateTimeValue value, bool detached = false);
+CMPIArray* makeArray(const void* owner, ArrayData data, bool detached = false);
+CMPIObjectPath* makeObjectPath(const void* owner, PathData data, bool detached = false);
+CMPIInstance* makeInstance(const void* owner, InstanceData data, bool detached = false);
+CMPIArgs* makeArgs(const void* owner, NamedData data, bool detached = false);
+CMPIContext* makeContext(const void* owner, NamedData data, bool prepared = false,
+                         bool detached = false);
+CMPIEnumeration* makeEnumeration(const void* owner, std::vector<Datum> items,
+                                 bool detached = false);
+CMPIResult* makeResult(const void* owner, std::shared_ptr<ResultSink> sink);
+
+// Conversions between CMPI values and Datums. fromCmpi refuses dead handles and unsupported
+// types; toCmpi makes fresh objects in the current arena for encapsulated values.
+CMPIrc datumFromCmpi(const CMPIValue* value, CMPIType type, Datum& out);
+CMPIData datumToCmpi(const void* owner, const Datum& datum);
+
+// Snapshots of live objects (nullopt for dead or foreign handles).
+std::optional<std::string> stringOf(const CMPIString* s);
+std::optional<PathData> pathOf(const CMPIObjectPath* op);
+std::optional<InstanceData> instanceOf(const CMPIInstance* inst);
+std::optional<NamedData> argsOf(const CMPIArgs* args);
+std::optional<NamedData> contextOf(const CMPIContext* ctx);
+
+// Indexed access shared by instance, object path, args and context tables.
+CMPIData namedAt(const void* owner, const NamedData& list, CMPICount index, CMPIString** name,
+                 CMPIStatus* rc);
+CMPIData namedGet(const void* owner, const NamedData& list, const char* name, CMPIStatus* rc,
+                  CMPIValueState extraState = 0);
+
+}  // namespace nrv::host
+
+#endif  // NRV_HOST_ENCOBJECTS_H

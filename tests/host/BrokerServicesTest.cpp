@@ -1,0 +1,198 @@
+// Broker services an MI relies on besides the objects: up-calls routed with their arguments,
+// class hierarchy, object introspection, messages, thread attachment, OS and memory services,
+// and refusal of a foreign broker handle.
+#include <gtest/gtest.h>
+
+#include <thread>
+
+#include "HostTestSupport.h"
+#include "cmpimacs.h"
+#include "host/EncObjects.h"
+
+namespace nrv::host {
+namespace {
+
+class BrokerServicesTest : public ::testing::Test {
+ protected:
+  test::ScriptedRouter router;
+  Broker broker{router};
+  const CMPIBroker* mb = broker.cmpi();
+  std::unique_ptr<ArenaScope> scope = std::make_unique<ArenaScope>();
+  CMPIStatus rc{CMPI_RC_OK, nullptr};
+  CMPIContext* ctx = makeContext(mb, Broker::requestContext("root/test"));
+
+  void TearDown() override { scope.reset(); }
+
+  CMPIObjectPath* widget(const char* id) {
+    CMPIObjectPath* op = CMNewObjectPath(mb, "root/test", "TST_Widget", nullptr);
+    CMAddKey(op, "InstanceID", id, CMPI_chars);
+    return op;
+  }
+};
+
+TEST_F(BrokerServicesTest, UpcallCarriesPathPropertiesAndContext) {
+  InstanceData inst;
+  inst.path.className = "TST_Widget";
+  inst.properties.emplace_back("Name", Datum::string("n"));
+  router.next.items = {Datum::embedded(inst)};
+  const char* props[] = {"Name", nullptr};
+  CMPIInstance* got = CBGetInstance(mb, ctx, widget("W1"), props, &rc);
+  ASSERT_NE(got, nullptr);
+  EXPECT_EQ(router.last.op, Operation::GetInstance);
+  EXPECT_EQ(router.last.path.className, "TST_Widget");
+  ASSERT_TRUE(router.last.properties.has_value());
+  EXPECT_EQ(router.last.properties->at(0), "Name");
+  EXPECT_NE(findNamed(router.last.context, CMPIPrincipal), nullptr);
+  EXPECT_STREQ(CMGetCharPtr(CMGetProperty(got, "Name", nullptr).value.string), "n");
+}
+
+TEST_F(BrokerServicesTest, UpcallFailureKeepsCodeAndMessage) {
+  router.next = Outcome::failure(CMPI_RC_ERR_NOT_FOUND, "gone");
+  EXPECT_EQ(CBGetInstance(mb, ctx, widget("W1"), nullptr, &rc), nullptr);
+  EXPECT_EQ(rc.rc, CMPI_RC_ERR_NOT_FOUND);
+  ASSERT_NE(rc.msg, nullptr);
+  EXPECT_STREQ(CMGetCharPtr(rc.msg), "gone");
+  EXPECT_EQ(CBEnumInstances(mb, ctx, nullptr, nullptr, &rc), nullptr);
+  EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_PARAMETER);
+}
+
+TEST_F(BrokerServicesTest, AssociationUpcallsPassTheirFilters) {
+  CBAssociatorNames(mb, ctx, widget("W1"), "TST_Link", "TST_Gadget", "Widget", "Gadget", &rc);
+  EXPECT_EQ(router.last.op, Operation::AssociatorNames);
+  EXPECT_EQ(router.last.assocClass.value_or(""), "TST_Link");
+  EXPECT_EQ(router.last.resultClass.value_or(""), "TST_Gadget");
+  EXPECT_EQ(router.last.role.value_or(""), "Widget");
+  EXPECT_EQ(router.last.resultRole.value_or(""), "Gadget");
+  CBReferenceNames(mb, ctx, widget("W1"), nullptr, nullptr, &rc);
+  EXPECT_EQ(router.last.op, Operation::ReferenceNames);
+  EXPECT_FALSE(router.last.resultClass.has_value());
+}
+
+TEST_F(BrokerServicesTest, InvokeMethodReturnsValueAndOutArgs) {
+  router.next.returnValue = Datum::unsignedInt(CMPI_uint32, 5);
+  router.next.outArgs.emplace_back("Out", Datum::string("o"));
+  CMPIArgs* in = CMNewArgs(mb, nullptr);
+  CMAddArg(in, "X", "1", CMPI_chars);
+  CMPIArgs* out = CMNewArgs(mb, nullptr);
+  CMPIData d = CBInvokeMethod(mb, ctx, widget("W1"), "Go", in, out, &rc);
+  EXPECT_EQ(rc.rc, CMPI_RC_OK);
+  EXPECT_EQ(d.type, CMPI_uint32);
+  EXPECT_EQ(d.value.uint32, 5u);
+  EXPECT_EQ(router.last.method, "Go");
+  EXPECT_EQ(router.last.inArgs.size(), 1u);
+  EXPECT_STREQ(CMGetCharPtr(CMGetArg(out, "Out", nullptr).value.string), "o");
+  CBInvokeMethod(mb, ctx, widget("W1"), nullptr, in, out, &rc);
+  EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_PARAMETER);
+}
+
+TEST_F(BrokerServicesTest, ClassPathIsAFollowsTheParentTable) {
+  CMPIObjectPath* cs = CMNewObjectPath(mb, "root/kvlhost", "KVLD_ComputerSystem", nullptr);
+  EXPECT_TRUE(CMClassPathIsA(mb, cs, "CIM_ComputerSystem", &rc));
+  EXPECT_TRUE(CMClassPathIsA(mb, cs, "cim_managedelement", &rc));
+  EXPECT_TRUE(CMClassPathIsA(mb, cs, "KVLD_ComputerSystem", &rc));
+  EXPECT_FALSE(CMClassPathIsA(mb, cs, "CIM_Chassis", &rc));
+  broker.addClassParent("TST_Widget", "CIM_LogicalElement");
+  EXPECT_TRUE(CMClassPathIsA(mb, widget("W1"), "CIM_ManagedElement", &rc));
+  EXPECT_FALSE(CMClassPathIsA(mb, nullptr, "CIM_ManagedElement", &rc));
+  EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_PARAMETER);
+}
+
+TEST_F(BrokerServicesTest, ObjectIntrospection) {
+  CMPIObjectPath* op = widget("W1");
+  EXPECT_STREQ(CMGetCharPtr(CDGetType(mb, op, nullptr)), "CMPIObjectPath");
+  EXPECT_TRUE(CDIsOfType(mb, op, "CMPIObjectPath", nullptr));
+  EXPECT_FALSE(CDIsOfType(mb, op, "CMPIInstance", nullptr));
+  EXPECT_STREQ(CMGetCharPtr(CDToString(mb, op, nullptr)), "root/test:TST_Widget.InstanceID=\"W1\"");
+  int notAnObject = 0;
+  EXPECT_EQ(CDToString(mb, &notAnObject, &rc), nullptr);
+  EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_PARAMETER);
+}
+
+TEST_F(BrokerServicesTest, MessageInserts) {
+  CMPIString* s = CMGetMessage(mb, "ID1", "Card $0 has $1 ports, ok=$2", &rc,
+                               CMFmtArgs3(CMFmtChars("C1"), CMFmtSint(4), CMFmtBoolean(1)));
+  EXPECT_STREQ(CMGetCharPtr(s), "Card C1 has 4 ports, ok=true");
+  CMPIMsgFileHandle h = reinterpret_cast<CMPIMsgFileHandle>(1);
+  EXPECT_EQ(CMOpenMessageFile(mb, "file", &h).rc, CMPI_RC_OK);
+  EXPECT_EQ(h, nullptr);
+  EXPECT_EQ(CMLogMessage(mb, CMPI_SEV_INFO, "id", "text", nullptr).rc, CMPI_RC_OK);
+}
+
+TEST_F(BrokerServicesTest, ForeignBrokerHandleIsRefused) {
+  CMPIBroker fake = *mb;
+  fake.hdl = nullptr;
+  EXPECT_EQ(fake.eft->newString(&fake, "x", &rc), nullptr);
+  EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_HANDLE);
+  EXPECT_EQ(fake.bft->getInstance(&fake, ctx, widget("W1"), nullptr, &rc), nullptr);
+  EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_HANDLE);
+  EXPECT_EQ(router.calls, 0);
+}
+
+TEST_F(BrokerServicesTest, AttachedThreadOwnsItsObjectsUntilDetach) {
+  CMPIContext* prepared = CBPrepareAttachThread(mb, ctx);
+  ASSERT_NE(prepared, nullptr);
+  const size_t before = ObjectRegistry::instance().liveCount(mb);
+  CMPIrc attach = CMPI_RC_ERR_FAILED, detach = CMPI_RC_ERR_FAILED;
+  size_t during = 0;
+  std::thread t([&] {
+    attach = CBAttachThread(mb, prepared).rc;
+    for (int i = 0; i < 10; ++i) CMNewString(mb, "in thread", nullptr);
+    during = ObjectRegistry::instance().liveCount(mb);
+    detach = CBDetachThread(mb, prepared).rc;
+  });
+  t.join();
+  EXPECT_EQ(attach, CMPI_RC_OK);
+  EXPECT_EQ(detach, CMPI_RC_OK);
+  EXPECT_EQ(during, before + 10);
+  // The prepared context went with the detach.
+  EXPECT_EQ(ObjectRegistry::instance().liveCount(mb), before - 1);
+  EXPECT_EQ(CBDetachThread(mb, ctx).rc, CMPI_RC_ERR_FAILED);
+  EXPECT_EQ(CBAttachThread(mb, nullptr).rc, CMPI_RC_ERR_INVALID_PARAMETER);
+}
+
+TEST_F(BrokerServicesTest, MemoryMarkReleasesNewerObjects) {
+  const size_t before = ObjectRegistry::instance().liveCount(mb);
+  CMPIGcStat* gc = CBMemMark(mb, &rc);
+  ASSERT_NE(gc, nullptr);
+  CMPIString* s = CMNewString(mb, "x", nullptr);
+  CMNewArgs(mb, nullptr);
+  CBFreeString(mb, s);
+  EXPECT_EQ(ObjectRegistry::instance().liveCount(mb), before + 1);
+  EXPECT_EQ(CBMemRelease(mb, gc).rc, CMPI_RC_OK);
+  EXPECT_EQ(ObjectRegistry::instance().liveCount(mb), before);
+  EXPECT_EQ(CBMemRelease(mb, gc).rc, CMPI_RC_ERR_INVALID_PARAMETER);
+}
+
+TEST_F(BrokerServicesTest, OsServicesThreadsAndRecursiveMutex) {
+  const CMPIBrokerExtFT* x = mb->xft;
+  CMPI_MUTEX_TYPE m = x->newMutex(0);
+  x->lockMutex(m);
+  x->lockMutex(m);  // recursive
+  x->unlockMutex(m);
+  x->unlockMutex(m);
+  static int counter = 0;
+  counter = 0;
+  CMPI_THREAD_TYPE t = x->newThread(
+      [](void* arg) -> void* {
+        ++*static_cast<int*>(arg);
+        return arg;
+      },
+      &counter, 0);
+  ASSERT_NE(t, nullptr);
+  void* ret = nullptr;
+  EXPECT_EQ(x->joinThread(t, &ret), 0);
+  EXPECT_EQ(ret, &counter);
+  EXPECT_EQ(counter, 1);
+  static int once = 0;
+  static int onceRuns = 0;
+  x->threadOnce(&once, [] { ++onceRuns; });
+  x->threadOnce(&once, [] { ++onceRuns; });
+  EXPECT_EQ(onceRuns, 1);
+  x->destroyMutex(m);
+  char* name = x->resolveFileName("foo");
+  EXPECT_STREQ(name, "libfoo.so");
+  free(name);
+}
+
+}  // namespace
+}  // namespace nrv::host
