@@ -64,7 +64,7 @@ void put_phy(BlobWriter& w, const PhysicalPort& p) {
     w.text(n, "0.0062");
   w.u32(RM_PA_PHY_AUTO_NEG_STATUS, 1);
   w.u32(RM_PA_PHY_AUTO_NEG_ENABLE, 1);
-  w.u32(RM_PA_PHY_CABLE_NVP, 69);
+  w.u32(RM_PA_PHY_CABLE_NVP, p.cable_nvp);
   w.u32(RM_PA_PHY_TIME_SINCE_LINK, 86400);
   w.text(RM_PA_PHY_CONFIG_ID, "0x0003");
   w.text(RM_PA_PHY_FIRMWARE_REV, "2.4.5");

@@ -104,9 +104,13 @@ RM_STATUS handle_SetPortEnabled(HBA_NAME a1, HBA_UINT32 enabled, HBA_UINT8* conf
   });
 }
 
+// Beacon states: 1 not available, 2 off, 3 on.
 RM_STATUS handle_DiagBeacon(HBA_NAME a1, HBA_UINT32 state) {
+  if (state != 2 && state != 3) return kStatusBadValue;
   return on_function(a1, [&](Site& s, FunctionRef r) -> RM_STATUS {
-    card_of(s, r).ports[at(s, r).port].beacon = state != 0;
+    uint32_t& beacon = card_of(s, r).ports[at(s, r).port].beacon;
+    if (beacon == 1) return RM_STATUS_NOT_SUPPORTED;
+    beacon = state;
     return RM_STATUS_SUCCESS;
   });
 }
@@ -114,7 +118,7 @@ RM_STATUS handle_DiagBeacon(HBA_NAME a1, HBA_UINT32 state) {
 RM_STATUS handle_DiagBeaconState(HBA_NAME a1, HBA_UINT32* state) {
   if (state == nullptr) return kStatusBadArgument;
   return on_function(a1, [&](Site& s, FunctionRef r) -> RM_STATUS {
-    *state = card_of(s, r).ports[at(s, r).port].beacon ? 1 : 0;
+    *state = card_of(s, r).ports[at(s, r).port].beacon;
     return RM_STATUS_SUCCESS;
   });
 }

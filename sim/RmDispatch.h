@@ -35,7 +35,12 @@ NRV_RM_PAIRED_FUNCTIONS(NRVSIM_SIG_)
   X(VPGetAttributes) X(ReadWWN) X(ChangeWWN) X(RestoreWWN) X(GetWWNCapability)             \
   X(SetPortEnabled) X(DiagBeacon) X(DiagBeaconState) X(GetDumpDirectoryA)                  \
   X(SetDumpDirectory) X(GetDumpRetentionCount) X(SetDumpRetentionCount)                    \
-  X(GetFcpTargetMapping) X(ScsiInquiry) X(ScsiReadCapacity) X(SetOASLunState)
+  X(GetFcpTargetMapping) X(ScsiInquiry) X(ScsiReadCapacity) X(SetOASLunState)                \
+  X(DiagLoopBackTest) X(DiagLoopBackTestV2) X(DiagLoopBackTestV3) X(DiagPciLoopBackTest)     \
+  X(DiagPciLoopBackTestV2) X(DiagEchoTest) X(DiagEchoTestV2) X(DiagRunPOST) X(DiagRunTDR)    \
+  X(DiagGetResults) X(DiagCancelDiagnostic) X(DiagSetNVP) X(DownloadFirmware) X(ResetHBA)    \
+  X(GenerateDump) X(GenerateEfdDump) X(GenerateCoreDump) X(GetDumpFileNames)                 \
+  X(DeleteDumpFiles) X(RetrieveFATDump) X(RetrieveFATDump2)
 
 template <class Tag>
 struct Dispatch {

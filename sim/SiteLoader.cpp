@@ -449,6 +449,7 @@ Card read_card(const Node& n) {
     port.link_down_reason = p.u32("link_down_reason", 0);
     port.enabled = p.boolean("enabled", true);
     port.is_10gbaset = p.boolean("10gbaset", false);
+    port.beacon = p.boolean("beacon_available", true) ? 2 : 1;
     if (p.has("sff")) port.sff = read_sff(p.at("sff"));
     c.ports.push_back(std::move(port));
   }

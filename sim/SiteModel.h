@@ -131,7 +131,8 @@ struct PhysicalPort {
   uint32_t max_speed_mbps = 10000;
   uint32_t link_down_reason = 0;
   bool enabled = true;
-  bool beacon = false;
+  uint32_t beacon = 2;     // library beacon state: 2 off, 3 on (1: not available)
+  uint32_t cable_nvp = 69; // nominal velocity of propagation, percent
   bool is_10gbaset = false;
   SffData sff;
 };
@@ -193,10 +194,20 @@ struct LibraryInfo {
   uint32_t dump_retention = 10;
 };
 
+// A diagnostic started through the library, until its results are read.
+struct DiagRun {
+  Wwn function{};
+  uint32_t kind = 0;    // which start call made it (library's numbering)
+  uint32_t cycles = 0;
+};
+
 struct Site {
   LibraryInfo library;
   std::vector<Card> cards;
   uint32_t next_session_id = 1;
+  std::map<uint32_t, DiagRun> diagnostics;  // by handle
+  uint32_t next_diag_handle = 1;
+  std::vector<std::string> dump_files;
 };
 
 }  // namespace nrvsim

@@ -279,6 +279,29 @@ TEST_F(ManagementLibrary, DriverParametersAnswerSevenThenChangeWithinRange) {
   EXPECT_EQ(current, 64u);
 }
 
+TEST_F(ManagementLibrary, DiagnosticsFinishAndBeaconStatesPersist) {
+  const HBA_NAME nic = first_of(RM_PROTOCOL_NIC);
+  HBA_UINT32 handle = 0;
+  ASSERT_EQ(SIM_CALL(lrmapi(), LRM_DiagLoopBackTestV3, nic, 3, 100, 0, &handle, 0, "A5A5"), 0u);
+  RM_DIAG_RESULT result{};
+  ASSERT_EQ(SIM_CALL(lrmapi(), LRM_DiagGetResults, nic, handle, &result), 0u);
+  EXPECT_EQ(result.state, RM_DIAG_STATE_FINISHED);
+  EXPECT_EQ(result.cyclesComplete, 100u);
+  EXPECT_STREQ(result.resultText, "Success");
+  EXPECT_NE(SIM_CALL(lrmapi(), LRM_DiagGetResults, nic, handle, &result), 0u);  // results are read once
+  // Cable tests need a 10GBASE-T port; the converged card has SFP+ cages.
+  EXPECT_EQ(SIM_CALL(lrmapi(), LRM_DiagRunTDR, nic, &handle), RM_STATUS_NOT_SUPPORTED);
+  ASSERT_EQ(SIM_CALL(lrmapi(), LRM_DiagRunTDR, functions().back().wwpn, &handle), 0u);
+
+  HBA_UINT32 state = 0;
+  ASSERT_EQ(SIM_CALL(lrmapi(), LRM_DiagBeaconState, nic, &state), 0u);
+  EXPECT_EQ(state, 2u);
+  ASSERT_EQ(SIM_CALL(lrmapi(), LRM_DiagBeacon, nic, 3), 0u);
+  SIM_CALL(lrmapi(), LRM_DiagBeaconState, nic, &state);
+  EXPECT_EQ(state, 3u);
+  EXPECT_NE(SIM_CALL(lrmapi(), LRM_DiagBeacon, nic, 7), 0u);
+}
+
 TEST_F(ManagementLibrary, InitLibReportsTheSitesStatus) {
   EXPECT_EQ(SIM_CALL(lrmapi(), LRM_InitLib), 0u);
   EXPECT_EQ(SIM_CALL(lrmapi(), RM_InitLib), 0u);
