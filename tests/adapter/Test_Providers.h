@@ -1,0 +1,58 @@
+// A small provider set over real module classes, built with the framework
+// exactly as module providers are: NRVTAVO_Card (every instance operation),
+// NRVTAVO_Chip (enumeration only, so get-instance falls back), the
+// association NRVTAVO_CardContainsChip (enumeration only, so references and
+// associators fall back) and NRVTAVO_ChannelMgmtService (extrinsic methods).
+// Their data lives in one test store that each test resets.
+#pragma once
+
+#include <string>
+
+#include "framework/CMPI_Static_Data.h"
+#include "framework/Instance_Map.h"
+#include "schema/CIM_ConcreteJob.h"
+#include "schema/NRVTAVO_Card.h"
+#include "schema/NRVTAVO_CardContainsChip.h"
+#include "schema/NRVTAVO_ChannelMgmtService.h"
+#include "schema/NRVTAVO_ChannelSettingData.h"
+#include "schema/NRVTAVO_Chip.h"
+
+namespace test {
+
+using namespace cimple;
+
+struct Store {
+  Instance_Map cards{&NRVTAVO_Card::static_meta_class};
+  Instance_Map chips{&NRVTAVO_Chip::static_meta_class};
+  Instance_Map links{&NRVTAVO_CardContainsChip::static_meta_class};
+  Instance_Map services{&NRVTAVO_ChannelMgmtService::static_meta_class};
+  int loads = 0;
+  int unloads = 0;
+  bool associators_supported = false;  // the link provider answers enum_associators itself
+  // What the last method call saw.
+  bool requested_state_null = true;
+  uint16_t requested_state = 0;
+  bool timeout_null = true;
+  std::string target_name;
+  std::string min_bandwidths;  // "1,2,3"
+};
+
+Store& store();
+void reset_store();
+
+NRVTAVO_Card* make_card(const char* tag, const char* model = "LPe");
+NRVTAVO_Chip* make_chip(const char* tag);
+NRVTAVO_CardContainsChip* make_link(const char* card_tag, const char* chip_tag);
+NRVTAVO_ChannelMgmtService* make_service(const char* name);
+
+// A provider's registration and static adapter record.
+struct Provider_Slot {
+  const Provider_Registration* registration;
+  CMPI_Static_Data* record;
+};
+Provider_Slot card_slot();
+Provider_Slot chip_slot();
+Provider_Slot link_slot();
+Provider_Slot service_slot();
+
+}  // namespace test
