@@ -1,6 +1,7 @@
 // Threads started through the framework inherit the broker context (and
 // attach/detach around their work); up-calls through cimom reach the broker.
 #include <atomic>
+#include <thread>
 
 #include "framework/Converter.h"
 #include "framework/Thread.h"
@@ -141,6 +142,30 @@ TEST_F(Threads, TheUserNameComesFromThePrincipalOrIsReportedMissing) {
   }
   CMRelease(anonymous);
   EXPECT_NE(traces().find("username not OK cmpirc="), std::string::npos);
+}
+
+TEST_F(Threads, ConcurrentCallsOnProvidersAreSerialisedPerAdapter) {
+  for (int i = 0; i < 20; ++i) store().cards.insert(make_card(("P" + std::to_string(i)).c_str()));
+  store().chips.insert(make_chip("C1"));
+  CMPIInstanceMI* cards = instance_mi(card_slot());
+  CMPIInstanceMI* chips = instance_mi(chip_slot());
+  std::atomic<int> failures{0};
+  auto worker = [&](CMPIInstanceMI* mi, const char* class_name, size_t expected) {
+    for (int round = 0; round < 15; ++round) {
+      CMPIObjectPath* class_path = fake::new_path(kNs, class_name);
+      fake::Result result;
+      CMPIStatus rc = mi->ft->enumerateInstanceNames(mi, context_, result.get(), class_path);
+      if (rc.rc != CMPI_RC_OK || result.returned().paths.size() != expected) ++failures;
+      CMRelease(class_path);
+    }
+  };
+  std::vector<std::thread> threads;
+  for (int t = 0; t < 3; ++t) {
+    threads.emplace_back(worker, cards, "NRVTAVO_Card", 20u);
+    threads.emplace_back(worker, chips, "NRVTAVO_Chip", 1u);
+  }
+  for (std::thread& t : threads) t.join();
+  EXPECT_EQ(failures.load(), 0);
 }
 
 TEST(Thread_Stack, UpCallsWithoutAContextFail) {
