@@ -161,7 +161,8 @@ HBA_UINT32 RM_GetNumberOfLocalAdapters() {
   });
 }
 
-RM_STATUS RM_GetVersion(char* text, HBA_UINT32 size) {
+// Every library code answers the one version of this library.
+RM_STATUS RM_GetVersion(HBA_UINT32 /*library code*/, char* text, HBA_UINT32 size) {
   if (auto st = gate("RM_GetVersion", RM_STATUS_ERROR)) return *st;
   if (text == nullptr || size == 0) return kStatusBadArgument;
   return SimSite::instance().with([&](Site& s) {
