@@ -24,7 +24,9 @@ bool take_snapshot(ProviderAgent& agent, Instance_Map& map, Catalogue catalogue,
       catalogue == Catalogue::SAN ? agent.waitForSANMaps() : agent.waitForAdapterMaps();
   std::lock_guard<std::recursive_mutex> data(agent.m_DataMutex);
   for (size_t i = 0; i < map.size(); ++i) {
-    if (snapshot.insert(clone(map[i])) < 0) {
+    Instance* copy = clone(map[i]);
+    if (snapshot.insert(copy) < 0) {
+      destroy(copy);  // a refused instance stays ours
       NRV_LOG_AS_AGENT(NRV_CRIT, "Insert failed for %zu", i);
       snapshot.clear();
       return false;
@@ -35,12 +37,7 @@ bool take_snapshot(ProviderAgent& agent, Instance_Map& map, Catalogue catalogue,
 
 }  // namespace
 
-int agent_load() {
-  ProviderAgent* agent = ProviderAgent::getInstance();
-  if (!agent->m_bIsLoaded) return LOAD_FAILED;
-  ProviderAgent::addRef();
-  return LOAD_OK;
-}
+int agent_load() { return ProviderAgent::acquireLoaded() ? LOAD_OK : LOAD_FAILED; }
 
 int agent_unload(const char* class_name) {
   NRV_LOG(NRV_DBG, "%s_Provider::unload()", class_name);

@@ -86,8 +86,8 @@ int NRVTAVO_ProviderConfigSetting_Provider::modify_instance(const Instance* mode
   NRV_LOG(NRV_DBG, "NRVTAVO_ProviderConfigSetting_Provider::modify_instance()");
   ProviderAgent& agent = *ProviderAgent::getInstance();
   agent.BuildCimpleInfo();
-  agent.waitForAdapterData().unlock();
-  agent.waitForAdapterMaps().unlock();
+  agent.waitForAdapterData(true).unlock();
+  agent.waitForAdapterMaps(true).unlock();
 
   std::lock_guard<std::recursive_mutex> data(agent.m_DataMutex);
   // Anything but this class would be read through the wrong layout.

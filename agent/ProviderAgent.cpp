@@ -51,15 +51,19 @@ void ProviderAgent::useBuilders(const Catalogue_Builders& builders) {
   s_Builders = builders;
 }
 
-ProviderAgent* ProviderAgent::getInstance() {
-  if (ProviderAgent* agent = s_pAgent.load(std::memory_order_acquire)) return agent;
-  std::lock_guard<std::mutex> lock(s_AgentMutex);
+ProviderAgent* ProviderAgent::instanceLocked() {
   ProviderAgent* agent = s_pAgent.load(std::memory_order_relaxed);
   if (agent == nullptr) {
     agent = new ProviderAgent(s_Builders);
     s_pAgent.store(agent, std::memory_order_release);
   }
   return agent;
+}
+
+ProviderAgent* ProviderAgent::getInstance() {
+  if (ProviderAgent* agent = s_pAgent.load(std::memory_order_acquire)) return agent;
+  std::lock_guard<std::mutex> lock(s_AgentMutex);
+  return instanceLocked();
 }
 
 ProviderAgent* ProviderAgent::peekInstance() { return s_pAgent.load(std::memory_order_acquire); }
@@ -73,6 +77,15 @@ void ProviderAgent::addRef() {
   NRV_LOG(NRV_DBG, "ProviderAgent::addRef[%d]", refCount());
   std::lock_guard<std::mutex> lock(s_AgentMutex);
   ++s_RefCount;
+}
+
+bool ProviderAgent::acquireLoaded() {
+  std::lock_guard<std::mutex> lock(s_AgentMutex);
+  if (!instanceLocked()->m_bIsLoaded) return false;
+  // The count is logged before the change, as addRef does.
+  NRV_LOG(NRV_DBG, "ProviderAgent::addRef[%d]", s_RefCount);
+  ++s_RefCount;
+  return true;
 }
 
 void ProviderAgent::releaseRef() {

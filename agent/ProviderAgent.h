@@ -70,6 +70,11 @@ class ProviderAgent {
   // The agent if one exists, else null; does not construct it.
   static ProviderAgent* peekInstance();
   static void addRef();
+  // A provider's load: getInstance and, when the agent is loaded, addRef,
+  // both under the agent mutex so that a load racing with the last unload
+  // never takes a reference on an agent being destroyed.  False (no
+  // reference taken) when the agent's construction failed.
+  static bool acquireLoaded();
   // Destroys the agent when the count drops to zero.  The count never goes
   // below zero, so an unload without a successful load does no harm.
   static void releaseRef();
@@ -87,9 +92,10 @@ class ProviderAgent {
   int BuildCimpleInfo();
 
   // Reader side of the contract.  Each answers the ready lock, held, once the
-  // flag is set; the caller then locks m_DataMutex and copies.
-  std::unique_lock<std::mutex> waitForAdapterData();
-  std::unique_lock<std::mutex> waitForAdapterMaps();
+  // flag is set; the caller then locks m_DataMutex and copies.  With `trace`
+  // the wait is logged ("PERF: Waiting for ...", "PERF: Woken up ...").
+  std::unique_lock<std::mutex> waitForAdapterData(bool trace = false);
+  std::unique_lock<std::mutex> waitForAdapterMaps(bool trace = false);
   std::unique_lock<std::mutex> waitForSANMaps();
   // A SAN reader calls this before BuildCimpleInfo: when the SAN maps are not
   // ready it asks the next fetch to build them.
@@ -169,6 +175,9 @@ class ProviderAgent {
   std::atomic<bool> m_bOwnComputerSystem{false};
 
  private:
+  // The agent, constructed if absent; the agent mutex held.
+  static ProviderAgent* instanceLocked();
+
   explicit ProviderAgent(const Catalogue_Builders& builders);
   ~ProviderAgent();
   void construct();

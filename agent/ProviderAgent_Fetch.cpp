@@ -27,17 +27,19 @@ constexpr uint64_t kUsecPerMinute = 60000000ULL;
 
 // ---- reader side ---------------------------------------------------------------
 
-std::unique_lock<std::mutex> ProviderAgent::waitForAdapterData() {
+std::unique_lock<std::mutex> ProviderAgent::waitForAdapterData(bool trace) {
   std::unique_lock<std::mutex> lock(m_AdapterDataReadyMutex);
-  wait_for(lock, m_AdapterDataReadyCond, m_bIsAdapterDataReady, "PERF: Waiting for m_AdapterDataReadyMutex",
-           "PERF: Woken up from wait for m_AdapterDataReadyMutex");
+  wait_for(lock, m_AdapterDataReadyCond, m_bIsAdapterDataReady,
+           trace ? "PERF: Waiting for m_AdapterDataReadyMutex" : nullptr,
+           trace ? "PERF: Woken up from wait for m_AdapterDataReadyMutex" : nullptr);
   return lock;
 }
 
-std::unique_lock<std::mutex> ProviderAgent::waitForAdapterMaps() {
+std::unique_lock<std::mutex> ProviderAgent::waitForAdapterMaps(bool trace) {
   std::unique_lock<std::mutex> lock(m_AdapterMapsReadyMutex);
-  wait_for(lock, m_AdapterMapsReadyCond, m_bIsAdapterMapsReady, "PERF: Waiting for m_AdapterMapsReadyMutex",
-           "PERF: Woken up from wait for m_AdapterMapsReadyMutex");
+  wait_for(lock, m_AdapterMapsReadyCond, m_bIsAdapterMapsReady,
+           trace ? "PERF: Waiting for m_AdapterMapsReadyMutex" : nullptr,
+           trace ? "PERF: Woken up from wait for m_AdapterMapsReadyMutex" : nullptr);
   return lock;
 }
 
