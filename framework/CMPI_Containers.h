@@ -1,6 +1,6 @@
-// The containers over CMPI objects (object path keys, instance properties,
-// method arguments) and the conversions of single values between CMPI data
-// and cimple::Value that they share.
+// The containers over CMPI objects: object path keys, instance properties
+// and method arguments, each read and written through the CMPI functions of
+// its object kind.
 //
 // Contract: a container borrows the CMPI object it wraps and the strings of
 // its CMPI_Env; both must outlive it.  Conversion failures are logged to the
@@ -9,18 +9,10 @@
 
 #include <string>
 
-#include "framework/CMPI_Ptr.h"
+#include "framework/CMPI_Data.h"
 #include "framework/Container.h"
 
 namespace cimple {
-
-// CMPI data -> Value of `type` (a Value type).  `name` names the entry in
-// messages; `feature` (may be null) gives the class of references.
-int cmpi_to_value(const CMPI_Env& env, const char* name, const CMPIData& data, int type,
-                  const Meta_Feature* feature, Value& value);
-// Value -> CMPI value owned by `out`.  References become object paths in
-// their own name space, or `env.name_space` when they have none.
-int value_to_cmpi(const CMPI_Env& env, const Value& value, CMPI_Out_Value& out);
 
 class CMPI_Container : public Container {
  protected:
