@@ -8,7 +8,9 @@
 #include <cerrno>
 #include <mutex>
 #include <stdexcept>
+#include <algorithm>
 
+#include "access/NRV_WrapperCall.h"
 #include "logging/Log.h"
 
 namespace cimple {
@@ -28,22 +30,6 @@ void closeAndUnlink(sem_t*& sem, const std::string& name) {
   sem_close(sem);
   sem_unlink(name.c_str());
   sem = nullptr;
-}
-
-// Validates `name`, then runs `call`; logs a failure of either.
-template <class Call>
-RM_STATUS validated(const HBA_NAME& name, const char* operation, Call call) {
-  NRV_LOG(NRV_DBG, "Entering NRV_MethodWrapper::%s", operation);
-  if (NRV_MethodWrapper::Validatewwpn(name) != 0) {
-    NRV_LOG(NRV_ERR, "INVALID wwpn");
-    return RM_STATUS_ERROR;
-  }
-  const RM_STATUS status = call();
-  if (status != RM_STATUS_SUCCESS) {
-    NRV_LOG(NRV_ERR, "NRV_MethodWrapper::%s failed with %d", operation, static_cast<int>(status));
-    NRV_MethodWrapper::logStatus(status);
-  }
-  return status;
 }
 
 }  // namespace
@@ -186,13 +172,10 @@ void NRV_MethodWrapper::logStatus(RM_STATUS status) {
 // ---- Library information ----------------------------------------------------------
 
 namespace {
-template <class Fn>
-RM_STATUS readVersion(Fn fn, const char* what, std::string& version) {
-  char text[256] = {};
-  const RM_STATUS status = fn(text, sizeof text);
-  text[sizeof text - 1] = '\0';
+RM_STATUS keepVersion(RM_STATUS status, const char* what, const char* text, std::string& version) {
   if (status != RM_STATUS_SUCCESS) {
     NRV_LOG(NRV_ERR, "%s failed with %d", what, static_cast<int>(status));
+    NRV_MethodWrapper::logStatus(status);
     return status;
   }
   version = text;
@@ -200,63 +183,73 @@ RM_STATUS readVersion(Fn fn, const char* what, std::string& version) {
 }
 }  // namespace
 
-RM_STATUS NRV_MethodWrapper::GetLibraryVersion(std::string& version) {
-  return readVersion(RM_GetVersion, "RM_GetVersion", version);
+RM_STATUS NRV_MethodWrapper::GetLibraryVersion(HBA_UINT32 library, std::string& version) {
+  char text[256] = {};
+  const RM_STATUS status = RM_GetVersion(library, text, sizeof text - 1);
+  return keepVersion(status, "RM_GetVersion", text, version);
 }
 
 RM_STATUS NRV_MethodWrapper::GetTIROLibVersion(std::string& version) {
-  return readVersion(RM_TiroVersion, "RM_TiroVersion", version);
+  char text[256] = {};
+  const RM_STATUS status = RM_TiroVersion(text, sizeof text - 1);
+  return keepVersion(status, "RM_TiroVersion", text, version);
 }
 
 RM_STATUS NRV_MethodWrapper::SetTIROTraceLevel(HBA_UINT32 mask, HBA_UINT32 level) {
+  NRV_LOG(NRV_DBG, "Entering NRV_MethodWrapper::SetTIROTraceLevel");
   const RM_STATUS status = LRM_SetDebugTraces(mask, level);
   if (status != RM_STATUS_SUCCESS) logStatus(status);
   return status;
 }
 
-// ---- Simple adapter operations ------------------------------------------------------
-
-RM_STATUS NRV_MethodWrapper::nrvcimReset(const HBA_NAME& name) {
-  return validated(name, "nrvcimReset", [&] { return LRM_ResetHBA(name); });
-}
-
-RM_STATUS NRV_MethodWrapper::nrvcimGetRetentionCount(const HBA_NAME& name, HBA_UINT32& count) {
-  return validated(name, "nrvcimGetRetentionCount",
-                   [&] { return LRM_GetDumpRetentionCount(name, &count); });
-}
-
-RM_STATUS NRV_MethodWrapper::SetRetentionCount(const HBA_NAME& name, HBA_UINT32 count) {
-  return validated(name, "SetRetentionCount", [&] { return LRM_SetDumpRetentionCount(name, count); });
-}
-
-RM_STATUS NRV_MethodWrapper::nrvcimDeleteDumpFiles(const HBA_NAME& name) {
-  return validated(name, "nrvcimDeleteDumpFiles", [&] { return LRM_DeleteDumpFiles(name); });
-}
-
-RM_STATUS NRV_MethodWrapper::nrvcimGetDumpDirectory(const HBA_NAME& name, std::string& directory) {
-  return validated(name, "nrvcimGetDumpDirectory", [&] {
-    char text[256] = {};
-    const RM_STATUS status = LRM_GetDumpDirectoryA(name, text, sizeof text);
-    text[sizeof text - 1] = '\0';
-    if (status == RM_STATUS_SUCCESS) directory = text;
+RM_STATUS NRV_MethodWrapper::getTargetOS_info(std::string& os) {
+  NRV_LOG(NRV_DBG, "Entering NRV_MethodWrapper::getTargetOS_info");
+  // The server's attributes belong to no adapter; the library takes the null name.
+  const HBA_NAME server{};
+  std::vector<uint8_t> record;
+  const RM_STATUS status =
+      wrapper::readSized(record, RM_SERVER_ATTRIBUTES_SIZE, [&](void* buffer, HBA_UINT32* size) {
+        return LRM_GetServerAttributes(server, buffer, size);
+      });
+  if (status != RM_STATUS_SUCCESS) {
+    logStatus(status);
     return status;
-  });
+  }
+  const size_t limit = std::min(record.size(), RM_TARGET_OS_TEXT_SIZE - 1);
+  os = wrapper::fieldText(reinterpret_cast<const char*>(record.data()), limit);
+  return status;
 }
 
-RM_STATUS NRV_MethodWrapper::SetPortEnabled(const HBA_NAME& name, HBA_UINT32 enabled,
-                                            HBA_UINT8& configStatus) {
-  return validated(name, "SetPortEnabled",
-                   [&] { return LRM_SetPortEnabled(name, enabled, &configStatus); });
+// ---- Helpers shared by the operations ------------------------------------------------
+
+namespace wrapper {
+
+bool offers(const HBA_NAME& name, HBA_UINT32 feature, const char* absentText) {
+  bool available = false;
+  const RM_STATUS status = NRV_MethodWrapper::HasFeature(name, feature, available);
+  if (!available && absentText != nullptr)
+    NRV_LOG(NRV_ERR, "%s: Return value: %d, Feature: %u", absentText, static_cast<int>(status),
+            static_cast<unsigned>(feature));
+  return available;
 }
 
-RM_STATUS NRV_MethodWrapper::SetCableNVP(const HBA_NAME& name, HBA_UINT32 nvp) {
-  return validated(name, "SetCableNVP", [&] { return LRM_DiagSetNVP(name, nvp); });
+bool blobInteger(void* blob, HBA_UINT16 attribute, HBA_UINT32& value) {
+  HBA_UINT16 length = 0;
+  HBA_UINT32 status = 0;
+  const void* p = RM_GetAttributeValue(blob, attribute, &length, &status);
+  if (p == nullptr || status != RM_STATUS_SUCCESS || length < sizeof value) return false;
+  std::memcpy(&value, p, sizeof value);
+  return true;
 }
 
-RM_STATUS NRV_MethodWrapper::SetiSCSIBoot(const HBA_NAME& name, HBA_UINT32 enabled) {
-  return validated(name, "SetiSCSIBoot", [&] {
-    return LRM_SetAdapterAttribute(name, RM_PA_ISCSI_BOOT_ENABLED, &enabled, sizeof enabled);
-  });
+bool blobText(void* blob, HBA_UINT16 attribute, std::string& value) {
+  HBA_UINT16 length = 0;
+  HBA_UINT32 status = 0;
+  const void* p = RM_GetAttributeValue(blob, attribute, &length, &status);
+  if (p == nullptr || status != RM_STATUS_SUCCESS) return false;
+  value = fieldText(static_cast<const char*>(p), length);
+  return true;
 }
 
+}  // namespace wrapper
 }  // namespace cimple

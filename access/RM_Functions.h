@@ -248,7 +248,8 @@ typedef void (*NRV_HBA_PORT_EVENT_CALLBACK)(void* data, HBA_WWN port, HBA_UINT32
   X(MGMT, void*, RM_GetNextVpdEntry, nullptr, void* /*cursor*/, char* /*keyword[4]*/,     \
     char* /*value[256]*/)                                                                 \
   X(MGMT, HBA_UINT32, RM_GetNumberOfLocalAdapters, 0)                                     \
-  X(MGMT, RM_STATUS, RM_GetVersion, 1, char* /*text*/, HBA_UINT32 /*size*/)               \
+  X(MGMT, RM_STATUS, RM_GetVersion, 1, HBA_UINT32 /*library code*/, char* /*text*/,        \
+    HBA_UINT32 /*size*/)                                                                  \
   X(MGMT, RM_STATUS, RM_ImportHBAFileA, 1, const char* /*path*/, HBA_UINT32* /*image*/)   \
   X(MGMT, RM_STATUS, RM_IsLocalHBA, 1, HBA_NAME, HBA_UINT32* /*is local*/)                \
   X(MGMT, RM_STATUS, RM_ListDeadNicPorts, 1, void* /*count + entries*/,                   \

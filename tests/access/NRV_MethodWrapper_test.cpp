@@ -169,7 +169,7 @@ TEST(WrapperChild, DISABLED_AdapterTests) {
   EXPECT_TRUE(log.contains("Status: <99>"));
 
   std::string version;
-  EXPECT_EQ(0u, NRV_MethodWrapper::GetLibraryVersion(version));
+  EXPECT_EQ(0u, NRV_MethodWrapper::GetLibraryVersion(102, version));
   EXPECT_EQ("12.4.270.9", version);
   // Not in the stub: the forwarder's failure value comes back as the status.
   EXPECT_EQ(1u, NRV_MethodWrapper::nrvcimReset(local()));

@@ -17,7 +17,7 @@ TEST(Simulator, WrapperOperationsReachTheSimulatedLibrary) {
   {
     NRV_MethodWrapper wrapper;
     std::string version;
-    EXPECT_EQ(0u, NRV_MethodWrapper::GetLibraryVersion(version));
+    EXPECT_EQ(0u, NRV_MethodWrapper::GetLibraryVersion(102, version));
     EXPECT_FALSE(version.empty());
 
     HBA_UINT32 count = 1;

@@ -62,8 +62,8 @@ RM_STATUS RM_StatusString(RM_STATUS status, char* text, HBA_UINT32 size) {
   return 0;
 }
 
-RM_STATUS RM_GetVersion(char* text, HBA_UINT32 size) {
-  std::snprintf(text, size, "12.4.270.9");
+RM_STATUS RM_GetVersion(HBA_UINT32 library, char* text, HBA_UINT32 size) {
+  std::snprintf(text, size, library == 104 ? "dfc 5.2" : "12.4.270.9");
   return 0;
 }
 
