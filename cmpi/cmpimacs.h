@@ -109,6 +109,10 @@
 #define CMToArray(en, rc) ((en)->ft->toArray((en), (rc)))
 
 /* ---- CMPIInstance ------------------------------------------------------ */
+/* Value arguments (setProperty, addKey, addArg, setElementAt, returnData, addEntry) point at a
+ * variable of the named type, e.g. &u16 for CMPI_uint16 or &str for CMPI_string. CMPI_chars is
+ * the exception CIMOMs make: the value pointer is the C string itself,
+ * CMSetProperty(ci, "Name", "text", CMPI_chars). A NULL value sets a NULL of that type. */
 #define CMGetProperty(inst, name, rc)          ((inst)->ft->getProperty((inst), (name), (rc)))
 #define CMGetPropertyAt(inst, num, name, rc)   ((inst)->ft->getPropertyAt((inst), (num), (name), (rc)))
 #define CMSetProperty(inst, name, value, type) \

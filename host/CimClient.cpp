@@ -272,11 +272,21 @@ int opDelete(Host& h, const Command&, const PathData& p, std::ostream&, std::ost
 int opCallMethod(Host& h, const Command& c, const PathData& p, std::ostream& out,
                  std::ostream& err) {
   if (c.extra.empty()) return usage("cm needs a method name", err);
-  const std::string& method = c.extra.front();
-  if (method.find('=') != std::string::npos) return usage("cm needs a method name before its arguments", err);
+  std::string method = c.extra.front();
+  std::vector<std::string> assignments(c.extra.begin() + 1, c.extra.end());
+  // wbemcli's compact form: Method.Arg=value,Arg2=value
+  if (const size_t dot = method.find('.'); dot != std::string::npos) {
+    auto inline_ = splitTopLevel(std::string_view(method).substr(dot + 1));
+    if (!inline_) return usage("unterminated string in method arguments", err);
+    assignments.insert(assignments.begin(), inline_->begin(), inline_->end());
+    method.resize(dot);
+  }
+  if (method.empty() || method.find('=') != std::string::npos) {
+    return usage("cm needs a method name before its arguments", err);
+  }
   // Untyped arguments travel as text, as a schema-less client sends them; the provider reads
   // them as its parameter types. "Name:type=value" sends an exact type.
-  auto args = readAssignments({c.extra.begin() + 1, c.extra.end()}, noHint, true);
+  auto args = readAssignments(assignments, noHint, true);
   if (auto* e = std::get_if<UsageError>(&args)) return usage(e->message, err);
   Result r = h.invokeMethod(p, method, std::get<NamedData>(std::move(args)));
   if (!r.ok()) return failed(r, err);

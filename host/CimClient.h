@@ -2,7 +2,11 @@
 // a provider module loaded into an in-process Host.
 //
 //   nrv-cim [options] <op> <path> [Name=value ...]
+//   nrv-cim [options] cm <path> <Method> [Arg=value ...]   (or <Method>.Arg=value,Arg2=value)
 //   ops: ei ein gi ai ain ri rin ci mi di cm
+//   values: "text", true/false, numbers, {a,b} arrays; Name:type=value gives the CIM type
+//   (uint16, string[], datetime, ref ...). Untyped method arguments are sent as strings;
+//   mi reads the types of the current instance. Default namespace "root/norvane".
 //   options: -m <module>, -p <prop,prop>, -ac|--assoc-class <C>, -rc|--result-class <C>,
 //            -r|--role <R>, -rr|--result-role <R>
 //

@@ -325,6 +325,12 @@ std::variant<Assignment, TextError> parseAssignment(std::string_view input) {
   return a;
 }
 
+std::optional<std::vector<std::string>> splitTopLevel(std::string_view text) {
+  auto parts = splitList(text);
+  if (!parts) return std::nullopt;
+  return std::vector<std::string>(parts->begin(), parts->end());
+}
+
 std::string formatPath(const PathData& path) {
   std::string out;
   if (!path.nameSpace.empty()) out = path.nameSpace + ":";

@@ -40,6 +40,8 @@ struct Assignment {
   std::string valueText;
 };
 std::variant<Assignment, TextError> parseAssignment(std::string_view text);
+// Splits "A=1,B=\"x,y\",C={1,2}" at its top-level commas; nullopt for an unterminated quote.
+std::optional<std::vector<std::string>> splitTopLevel(std::string_view text);
 
 std::string formatPath(const PathData& path);
 // A value as it appears in MOF output and key bindings: strings and datetimes quoted and

@@ -66,7 +66,7 @@ std::variant<void*, Outcome> ProviderTable::mi(const std::string& className, MiK
                             std::string("no ") + miKindSuffix(kind) + " provider for class " +
                                 className);
   }
-  std::lock_guard<std::mutex> lock(mu_);
+  std::lock_guard<std::recursive_mutex> lock(mu_);
   for (const auto& m : mis_) {
     if (m.factory == *factory && m.kind == kind) return m.mi;
   }
@@ -87,14 +87,14 @@ std::variant<void*, Outcome> ProviderTable::mi(const std::string& className, MiK
 }
 
 std::vector<LoadedMi> ProviderTable::loaded() const {
-  std::lock_guard<std::mutex> lock(mu_);
+  std::lock_guard<std::recursive_mutex> lock(mu_);
   return mis_;
 }
 
 std::vector<CleanupRecord> ProviderTable::cleanupAll(const NamedData& context) {
   std::vector<LoadedMi> mis;
   {
-    std::lock_guard<std::mutex> lock(mu_);
+    std::lock_guard<std::recursive_mutex> lock(mu_);
     mis.swap(mis_);
   }
   std::vector<CleanupRecord> records;

@@ -48,7 +48,8 @@ class ProviderTable {
  private:
   const ModuleLoader& module_;
   const CMPIBroker* broker_;
-  mutable std::mutex mu_;
+  // Recursive: a factory's load may up-call into a class whose MI is not made yet.
+  mutable std::recursive_mutex mu_;
   std::vector<LoadedMi> mis_;
 };
 

@@ -97,6 +97,8 @@ TEST(ClientTest, CallMethodWithArguments) {
   EXPECT_EQ(r.out, "ReturnValue = 5;\nNewCount = 5;\n");
   auto echo = cim({"cm", "root/test:TST_Widget.InstanceID=\"W2\"", "Echo", "Text=\"a b\""});
   EXPECT_EQ(echo.out, "ReturnValue = 0;\nEchoed = \"a b\";\n");
+  auto compact = cim({"cm", "root/test:TST_Widget.InstanceID=\"W2\"", "Echo.Text=\"x,y\""});
+  EXPECT_EQ(compact.out, "ReturnValue = 0;\nEchoed = \"x,y\";\n");
   auto bogus = cim({"cm", "root/test:TST_Widget.InstanceID=\"W2\"", "Bogus"});
   EXPECT_EQ(bogus.status, 1);
   EXPECT_EQ(bogus.err, "CMPI_RC_ERR_METHOD_NOT_FOUND : Bogus\n");

@@ -53,6 +53,13 @@ TEST_F(EncObjectsTest, ReleasedAndForeignHandlesAreRefused) {
   EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_HANDLE);
   EXPECT_EQ(CMNewString(mb, nullptr, &rc), nullptr);
   EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_PARAMETER);
+  // A live object of another kind is no string either.
+  CMPIArgs* args = CMNewArgs(mb, nullptr);
+  EXPECT_EQ(ft->getCharPtr(reinterpret_cast<CMPIString*>(args), &rc), nullptr);
+  EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_HANDLE);
+  EXPECT_EQ(ft->release(reinterpret_cast<CMPIString*>(args)).rc, CMPI_RC_ERR_INVALID_HANDLE);
+  EXPECT_EQ(CMGetArgCount(args, &rc), 0u);
+  EXPECT_EQ(rc.rc, CMPI_RC_OK);
 }
 
 TEST_F(EncObjectsTest, ArrayChecksIndexAndElementType) {
