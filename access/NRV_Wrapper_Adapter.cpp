@@ -18,7 +18,10 @@ RM_STATUS NRV_MethodWrapper::GetDeadNICPorts(std::vector<std::string>& ports) {
     logStatus(status);
     return status;
   }
-  for (const Entry& e : entries) ports.push_back(wrapper::fieldText(e.text, sizeof e.text));
+  for (const Entry& e : entries) {
+    std::string text = wrapper::fieldText(e.text, sizeof e.text);
+    if (!text.empty()) ports.push_back(std::move(text));
+  }
   return status;
 }
 

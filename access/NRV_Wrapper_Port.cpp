@@ -53,12 +53,12 @@ RM_STATUS NRV_MethodWrapper::SetChannelMgmtPortInfo(const HBA_NAME& name,
 
 RM_STATUS NRV_MethodWrapper::SetCMMode(const HBA_NAME& name, HBA_UINT32 mode) {
   return validated(name, "SetCMMode", [&]() -> RM_STATUS {
-    std::vector<uint8_t> record;
-    const RM_STATUS status = readRaw(LRM_GetChannelMgmtCNAInfo, name, record);
-    if (status != RM_STATUS_SUCCESS) return status;
     if (!wrapper::offers(name, RM_FEATURE_CHANNEL_MANAGEMENT,
                          "Channel management is not supported on this adapter"))
       return kNotSupported;
+    std::vector<uint8_t> record;
+    const RM_STATUS status = readRaw(LRM_GetChannelMgmtCNAInfo, name, record);
+    if (status != RM_STATUS_SUCCESS) return status;
     // The configured mode is the record's first word.
     if (record.size() < sizeof mode) record.resize(sizeof mode);
     std::memcpy(record.data(), &mode, sizeof mode);
