@@ -58,7 +58,7 @@ void Data::buildAdapterData() {
   while (m_AdapterCount == 0) {
     const bool scanning = !nicSeen;
     enumeratePass(&capacity, &nicSeen);
-    if (retries >= kMaxRetries) break;
+    if (m_AdapterCount != 0 || retries >= kMaxRetries) break;
     // The pass that first sees a NIC function ends there; the building pass
     // follows at once.  A building pass that creates nothing is retried like
     // a scanning pass, so a library that keeps failing cannot hold the
