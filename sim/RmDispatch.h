@@ -40,7 +40,10 @@ NRV_RM_PAIRED_FUNCTIONS(NRVSIM_SIG_)
   X(DiagPciLoopBackTestV2) X(DiagEchoTest) X(DiagEchoTestV2) X(DiagRunPOST) X(DiagRunTDR)    \
   X(DiagGetResults) X(DiagCancelDiagnostic) X(DiagSetNVP) X(DownloadFirmware) X(ResetHBA)    \
   X(GenerateDump) X(GenerateEfdDump) X(GenerateCoreDump) X(GetDumpFileNames)                 \
-  X(DeleteDumpFiles) X(RetrieveFATDump) X(RetrieveFATDump2)
+  X(DeleteDumpFiles) X(RetrieveFATDump) X(RetrieveFATDump2) X(iSCSI_AddBootTarget)         \
+  X(iSCSI_SetBootSession) X(iSCSI_GetTargetLoginAuthProperties)                              \
+  X(iSCSI_SetTargetLoginAuthProperties) X(iSCSI_SetTargetProperties)                         \
+  X(iSCSI_GetSendTargetPortalProperties) X(iSCSI_SetSendTargetPortalProperties) X(Ping)
 
 template <class Tag>
 struct Dispatch {

@@ -294,14 +294,39 @@ IpConfig read_ip(const Node& n) {
   return ip;
 }
 
+LoginOptions read_login(const Node& n) {
+  LoginOptions o;
+  auto flag = [&](const char* key, uint8_t def) {
+    const uint32_t v = n.u32(key, def);
+    if (v > 1) n.at(key).fail("must be 0 or 1");
+    return static_cast<uint8_t>(v);
+  };
+  o.immediate_data = flag("immediate_data", 1);
+  o.header_digest = flag("header_digest", 0);
+  o.data_digest = flag("data_digest", 0);
+  return o;
+}
+
+Authentication read_auth(const Node& n) {
+  Authentication a;
+  a.method = n.u32("auth", 0);
+  if (a.method > 2) n.at("auth").fail("must be 0 (none), 1 (one-way CHAP) or 2 (mutual CHAP)");
+  a.initiator_chap = n.str("chap_name");
+  a.initiator_secret = n.str("chap_secret");
+  a.target_chap = n.str("target_chap_name");
+  a.target_secret = n.str("target_chap_secret");
+  return a;
+}
+
 IscsiTarget read_iscsi_target(const Node& n) {
   IscsiTarget t;
   t.name = n.at("name").text();
   if (t.name.empty() || t.name.size() > 223) n.at("name").fail("iSCSI name must have 1 to 223 characters");
   t.alias = n.str("alias");
   t.portal = read_endpoint(n.at("portal"));
-  t.auth_method = n.u32("auth", 0);
-  t.chap_name = n.str("chap_name");
+  t.login = read_login(n);
+  t.auth = read_auth(n);
+  t.extended_timeout = n.u32("extended_timeout", 30);
   t.boot = n.boolean("boot", false);
   for (const Node& s : n.items("sessions")) {
     IscsiSession session;
@@ -393,9 +418,10 @@ Function read_function(const Node& n, const Card& card) {
       Node i = n.at("initiator");
       f.initiator.name = i.at("name").text();
       f.initiator.alias = i.str("alias");
-      f.initiator.auth_method = i.u32("auth", 0);
-      f.initiator.chap_name = i.str("chap_name");
-      for (const Node& p : i.items("send_target_portals")) f.initiator.portals.push_back(read_endpoint(p));
+      f.initiator.login = read_login(i);
+      f.initiator.auth = read_auth(i);
+      for (const Node& p : i.items("send_target_portals"))
+        f.initiator.portals.push_back(IscsiPortal{read_endpoint(p), f.initiator.login, {}});
       for (const Node& p : i.items("isns_servers")) f.initiator.isns.push_back(read_endpoint(p));
       f.initiator.isns_enabled = i.boolean("isns_enabled", !f.initiator.isns.empty());
     }

@@ -73,11 +73,27 @@ struct IscsiSession {
   std::vector<IscsiConnection> connections;
 };
 
+struct LoginOptions {
+  uint8_t immediate_data = 1, header_digest = 0, data_digest = 0;
+};
+
+struct Authentication {
+  uint32_t method = 0;  // 0 none, 1 one-way CHAP, 2 mutual
+  std::string initiator_chap, target_chap, initiator_secret, target_secret;
+};
+
+struct IscsiPortal {
+  Endpoint address;
+  LoginOptions login;
+  Authentication auth;
+};
+
 struct IscsiTarget {
   std::string name, alias;
   Endpoint portal;
-  uint32_t auth_method = 0;  // 0 none, 1 one-way CHAP, 2 mutual
-  std::string chap_name;
+  LoginOptions login;
+  Authentication auth;
+  uint32_t extended_timeout = 30;  // seconds
   bool boot = false;
   std::vector<IscsiSession> sessions;
   std::vector<ScsiUnit> luns;
@@ -85,9 +101,9 @@ struct IscsiTarget {
 
 struct IscsiInitiator {
   std::string name, alias;
-  uint32_t auth_method = 0;
-  std::string chap_name;
-  std::vector<Endpoint> portals;  // send-target portals
+  LoginOptions login;
+  Authentication auth;
+  std::vector<IscsiPortal> portals;  // send-target portals
   std::vector<Endpoint> isns;
   bool isns_enabled = false;
 };
