@@ -5,10 +5,10 @@
 #include <fcntl.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <mutex>
 #include <stdexcept>
-#include <algorithm>
 
 #include "access/NRV_WrapperCall.h"
 #include "logging/Log.h"

@@ -91,8 +91,8 @@ class NRV_MethodWrapper {
   struct FIPParams {
     std::string fabricName;  // "XX:XX:XX:XX:XX:XX:XX:XX"
     std::string switchName;
-    std::string vlan;        // decimal, or "Any"
-    std::string fcMap;       // "0x%02X%02X%02X"
+    std::string vlan;   // decimal, or "Any"
+    std::string fcMap;  // "0x%02X%02X%02X"
     HBA_UINT32 cinVlanId = 0;
   };
   // 0; 190 when the feature query answers 190; 2 without FIP support; else
@@ -126,6 +126,13 @@ class NRV_MethodWrapper {
   static RM_STATUS GetiSCSIBootState(const HBA_NAME& name, HBA_UINT32& state);
 
   // ---- iSCSI ----
+  // Told after a successful change of targets, sessions or portals, which
+  // the SAN catalogue must follow: `rebuildNow` is false for a new portal
+  // (the rebuild may wait for the next request).  Runs on the caller's thread
+  // while the caller holds its locks; null (the default) tells no one.
+  using SanChangeHandler = void (*)(bool rebuildNow);
+  static void setSanChangeHandler(SanChangeHandler handler);
+
   // Operations taking an address text answer kBadAddress when it does not
   // form an address record.
   static constexpr RM_STATUS kBadAddress = 4;
@@ -208,7 +215,8 @@ class NRV_MethodWrapper {
   static RM_STATUS SetVEPAState(const HBA_NAME& name, HBA_UINT32 state);
 
   // ---- Physical port ----
-  static RM_STATUS SetPortEnabled(const HBA_NAME& name, HBA_UINT32 enabled, HBA_UINT8& configStatus);
+  static RM_STATUS SetPortEnabled(const HBA_NAME& name, HBA_UINT32 enabled,
+                                  HBA_UINT8& configStatus);
   static RM_STATUS SetCableNVP(const HBA_NAME& name, HBA_UINT32 nvp);
   static RM_STATUS SetPhyPortSpeed(const HBA_NAME& name, const std::string& speed, HBA_UINT32 mode,
                                    HBA_UINT32 cableLength);
@@ -265,8 +273,8 @@ class NRV_MethodWrapper {
                            std::vector<std::pair<std::string, std::string>>& entries);
 
  private:
-  sem_t* m_Sem = nullptr;       // "/NRV_RM_INIT_LIB_<pid>", held while alive
-  sem_t* m_DoneSem = nullptr;   // "/NRV_RM_INIT_LIB_DONE_<pid>", first initialiser only
+  sem_t* m_Sem = nullptr;      // "/NRV_RM_INIT_LIB_<pid>", held while alive
+  sem_t* m_DoneSem = nullptr;  // "/NRV_RM_INIT_LIB_DONE_<pid>", first initialiser only
   std::string m_SemName;
   std::string m_DoneSemName;
 };

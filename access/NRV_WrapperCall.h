@@ -78,7 +78,8 @@ RM_STATUS readTable(std::vector<Entry>& out, HBA_UINT32 capacity, Fn fn) {
   const size_t room = (buffer.size() - sizeof(HBA_UINT32)) / sizeof(Entry);
   if (count > room) count = static_cast<HBA_UINT32>(room);
   out.resize(count);
-  if (count != 0) std::memcpy(out.data(), buffer.data() + sizeof(HBA_UINT32), count * sizeof(Entry));
+  if (count != 0)
+    std::memcpy(out.data(), buffer.data() + sizeof(HBA_UINT32), count * sizeof(Entry));
   return status;
 }
 

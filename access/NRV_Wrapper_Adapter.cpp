@@ -37,9 +37,8 @@ RM_STATUS NRV_MethodWrapper::GetHBAFeatureList(const HBA_NAME& name,
 RM_STATUS NRV_MethodWrapper::SetOASLunState(const HBA_NAME& name, const HBA_NAME& initiator,
                                             const HBA_NAME& target, HBA_UINT64 lun,
                                             HBA_UINT32 state, HBA_UINT32 option) {
-  return validated(name, "SetOASLunState", [&] {
-    return LRM_SetOASLunState(name, initiator, target, lun, state, option);
-  });
+  return validated(name, "SetOASLunState",
+                   [&] { return LRM_SetOASLunState(name, initiator, target, lun, state, option); });
 }
 
 RM_STATUS NRV_MethodWrapper::GetOASLunList(const HBA_NAME& name, std::vector<uint8_t>& record) {
@@ -90,9 +89,9 @@ RM_STATUS NRV_MethodWrapper::ReadVPD(const HBA_NAME& name,
   return validated(name, "ReadVPD", [&] {
     entries.clear();
     std::vector<uint8_t> vpd;
-    const RM_STATUS status = wrapper::readSized(vpd, RM_VPD_SIZE, [&](void* buffer, HBA_UINT32* size) {
-      return LRM_GetVPD(name, buffer, size);
-    });
+    const RM_STATUS status = wrapper::readSized(
+        vpd, RM_VPD_SIZE,
+        [&](void* buffer, HBA_UINT32* size) { return LRM_GetVPD(name, buffer, size); });
     if (status != RM_STATUS_SUCCESS) {
       NRV_LOG(NRV_ERR, "ERROR: RM_GetVPD call failed : %d", static_cast<int>(status));
       return status;

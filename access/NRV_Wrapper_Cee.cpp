@@ -100,8 +100,10 @@ RM_STATUS NRV_MethodWrapper::nrvSetFIPParams(const HBA_NAME& name, const FIPPara
     RM_FIP_PARAMS fip{};
     status = readRecord(LRM_CNA_FCOE_GetFIPParams, name, fip);
     if (status != RM_STATUS_SUCCESS) return status;
-    if ((!params.fabricName.empty() && str2HBAName(&list.fabricName, params.fabricName.c_str()) != 0) ||
-        (!params.switchName.empty() && str2HBAName(&list.switchName, params.switchName.c_str()) != 0) ||
+    if ((!params.fabricName.empty() &&
+         str2HBAName(&list.fabricName, params.fabricName.c_str()) != 0) ||
+        (!params.switchName.empty() &&
+         str2HBAName(&list.switchName, params.switchName.c_str()) != 0) ||
         (!params.vlan.empty() && !parseVlan(params.vlan, list)) ||
         (!params.fcMap.empty() && !parseFcMap(params.fcMap, fip.fcMap))) {
       NRV_LOG(NRV_ERR, "nrvSetFIPParams: malformed FIP parameter");
@@ -114,7 +116,8 @@ RM_STATUS NRV_MethodWrapper::nrvSetFIPParams(const HBA_NAME& name, const FIPPara
   });
 }
 
-RM_STATUS NRV_MethodWrapper::nrvcimGetCEEParams(const HBA_NAME& name, std::vector<uint8_t>& record) {
+RM_STATUS NRV_MethodWrapper::nrvcimGetCEEParams(const HBA_NAME& name,
+                                                std::vector<uint8_t>& record) {
   return validated(name, "nrvcimGetCEEParams", [&] {
     return wrapper::readSized(record, RM_CEE_PARAMS_SIZE, [&](void* buffer, HBA_UINT32* size) {
       return LRM_CNA_GetCEE_Params(name, buffer, size);
@@ -166,11 +169,16 @@ RM_STATUS NRV_MethodWrapper::nrvcimSetCEEParams(const HBA_NAME& name, const std:
     if (status != RM_STATUS_SUCCESS) return status;
     const RM_CEE_ITEM item{found->item, value};
     switch (found->writer) {
-      case CeeWriter::kDcbx: return writeRecord(LRM_CNA_SetDcbxPortVars, name, item);
-      case CeeWriter::kLldp: return writeRecord(LRM_CNA_SetLldp, name, item);
-      case CeeWriter::kPfc: return writeRecord(LRM_CNA_SetPFC, name, item);
-      case CeeWriter::kPgSetting: return writeRecord(LRM_CNA_SetPGSetting, name, item);
-      case CeeWriter::kTlv: return LRM_CNA_SetTLV(name, found->item, &value, sizeof value);
+      case CeeWriter::kDcbx:
+        return writeRecord(LRM_CNA_SetDcbxPortVars, name, item);
+      case CeeWriter::kLldp:
+        return writeRecord(LRM_CNA_SetLldp, name, item);
+      case CeeWriter::kPfc:
+        return writeRecord(LRM_CNA_SetPFC, name, item);
+      case CeeWriter::kPgSetting:
+        return writeRecord(LRM_CNA_SetPGSetting, name, item);
+      case CeeWriter::kTlv:
+        return LRM_CNA_SetTLV(name, found->item, &value, sizeof value);
     }
     return static_cast<RM_STATUS>(RM_STATUS_ERROR);
   });
@@ -285,10 +293,9 @@ RM_STATUS NRV_MethodWrapper::SetiSCSIBoot(const HBA_NAME& name, HBA_UINT32 enabl
 RM_STATUS NRV_MethodWrapper::GetiSCSIBootState(const HBA_NAME& name, HBA_UINT32& state) {
   return validated(name, "GetiSCSIBootState", [&]() -> RM_STATUS {
     std::vector<uint8_t> blob;
-    const RM_STATUS status =
-        wrapper::readSized(blob, RM_PORT_ATTRIBUTES_SIZE, [&](void* buffer, HBA_UINT32* size) {
-          return LRM_GetPortAttributes(name, buffer, size);
-        });
+    const RM_STATUS status = wrapper::readSized(
+        blob, RM_PORT_ATTRIBUTES_SIZE,
+        [&](void* buffer, HBA_UINT32* size) { return LRM_GetPortAttributes(name, buffer, size); });
     if (status != RM_STATUS_SUCCESS) return status;
     return wrapper::blobInteger(blob.data(), RM_PA_ISCSI_BOOT_ENABLED, state)
                ? RM_STATUS_SUCCESS

@@ -98,7 +98,8 @@ RM_STATUS NRV_MethodWrapper::nrvcimGetCoreDump(const HBA_NAME& name, const std::
   NRV_LOG(NRV_DBG, "GenerateCoreDump options: %s", options.c_str());
   const RM_STATUS status = LRM_GenerateCoreDump(name, options.c_str());
   if (status != RM_STATUS_SUCCESS && status != RM_STATUS_REBOOT_REQUIRED) {
-    NRV_LOG(NRV_ERR, "NRV_MethodWrapper::nrvcimGetCoreDump failed with %d", static_cast<int>(status));
+    NRV_LOG(NRV_ERR, "NRV_MethodWrapper::nrvcimGetCoreDump failed with %d",
+            static_cast<int>(status));
     logStatus(status);
   }
   return status;
@@ -127,8 +128,8 @@ RM_STATUS NRV_MethodWrapper::GetDumpFileNames(const HBA_NAME& name,
     std::memcpy(&count, buffer.data(), sizeof count);
     const size_t room = (buffer.size() - sizeof(HBA_UINT32)) / RM_DUMP_FILE_NAME_SIZE;
     for (size_t i = 0; i < std::min<size_t>(count, room); ++i) {
-      const char* entry =
-          reinterpret_cast<const char*>(buffer.data() + sizeof(HBA_UINT32) + i * RM_DUMP_FILE_NAME_SIZE);
+      const char* entry = reinterpret_cast<const char*>(buffer.data() + sizeof(HBA_UINT32) +
+                                                        i * RM_DUMP_FILE_NAME_SIZE);
       files.push_back(wrapper::fieldText(entry, RM_DUMP_FILE_NAME_SIZE));
     }
     return status;
@@ -153,8 +154,7 @@ RM_STATUS NRV_MethodWrapper::SetExtFATAdvancedData(const HBA_NAME& name, const s
   });
 }
 
-RM_STATUS NRV_MethodWrapper::nrvcimSetAdvancedDumpTraceLevel(const HBA_NAME& name,
-                                                             HBA_UINT32 level,
+RM_STATUS NRV_MethodWrapper::nrvcimSetAdvancedDumpTraceLevel(const HBA_NAME& name, HBA_UINT32 level,
                                                              HBA_UINT32 modeFlags) {
   return validated(name, "nrvcimSetAdvancedDumpTraceLevel",
                    [&] { return LRM_Set_VG_EventLogTraceLevel(name, level, modeFlags); });

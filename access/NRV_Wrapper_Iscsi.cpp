@@ -2,6 +2,8 @@
 // servers, ping, initiator properties, network settings, ARP and route tables.
 #include <arpa/inet.h>
 
+#include <atomic>
+
 #include "access/NRV_WrapperCall.h"
 
 namespace cimple {
@@ -9,6 +11,16 @@ namespace cimple {
 using wrapper::validated;
 
 namespace {
+
+std::atomic<NRV_MethodWrapper::SanChangeHandler> g_sanChanged{nullptr};
+
+// Passes a successful change on to the catalogue's owner.
+RM_STATUS sanChanged(RM_STATUS status, const char* text, bool rebuildNow) {
+  if (status != RM_STATUS_SUCCESS) return status;
+  if (text != nullptr) NRV_LOG(NRV_DBG, "%s", text);
+  if (auto handler = g_sanChanged.load()) handler(rebuildNow);
+  return status;
+}
 
 // The same operation with an address record built first; a text that does
 // not form one answers kBadAddress without calling the library.
@@ -37,6 +49,8 @@ bool makeSession(HBA_UINT32 sessionId, const std::string& address, RM_ISCSI_SESS
 
 }  // namespace
 
+void NRV_MethodWrapper::setSanChangeHandler(SanChangeHandler handler) { g_sanChanged = handler; }
+
 bool NRV_MethodWrapper::makeAddress(const std::string& text, HBA_UINT16 port, RM_IP_ADDRESS& out) {
   out = RM_IP_ADDRESS{};
   out.port = port;
@@ -50,8 +64,8 @@ bool NRV_MethodWrapper::makeAddress(const std::string& text, HBA_UINT16 port, RM
   return ipAddr2IpInfo(text.c_str(), &out) == 0;
 }
 
-RM_STATUS NRV_MethodWrapper::Ping(const HBA_NAME& name, const std::string& address,
-                                  HBA_UINT16 port, bool& reachable) {
+RM_STATUS NRV_MethodWrapper::Ping(const HBA_NAME& name, const std::string& address, HBA_UINT16 port,
+                                  bool& reachable) {
   reachable = false;
   return withAddress(name, "Ping", address, port, [&](const RM_IP_ADDRESS& record) {
     HBA_UINT8 answer = 0;
@@ -127,28 +141,32 @@ RM_STATUS NRV_MethodWrapper::SetTargetLoginAuthProperties(const HBA_NAME& name,
 RM_STATUS NRV_MethodWrapper::AddTargetPortal(const HBA_NAME& name, const std::string& address,
                                              HBA_UINT16 port, RM_ISCSI_LOGIN_OPTIONS& options,
                                              const RM_ISCSI_AUTH& auth) {
-  return withAddress(name, "AddTargetPortal", address, port, [&](const RM_IP_ADDRESS& record) {
-    const bool digestsAsked = options.headerDigest != 0 || options.dataDigest != 0;
-    RM_STATUS status = LRM_iSCSI_AddSendTargetPortal(name, &record, 0, &options, &auth);
-    const bool digestsKept = options.headerDigest != 0 || options.dataDigest != 0;
-    if (status == RM_STATUS_ISCSI_DIGEST_MISMATCH && digestsKept && !digestsAsked) {
-      // The existing portal still carries digests; replace it with one without.
-      NRV_LOG(NRV_DBG, "AddTargetPortal: re-adding the portal without digests");
-      status = LRM_iSCSI_RemoveSendTargetPortal(name, &record);
-      if (status != RM_STATUS_SUCCESS) return status;
-      options.headerDigest = 0;
-      options.dataDigest = 0;
-      status = LRM_iSCSI_AddSendTargetPortal(name, &record, 0, &options, &auth);
-    }
-    return status;
-  });
+  const RM_STATUS status =
+      withAddress(name, "AddTargetPortal", address, port, [&](const RM_IP_ADDRESS& record) {
+        const bool digestsAsked = options.headerDigest != 0 || options.dataDigest != 0;
+        RM_STATUS status = LRM_iSCSI_AddSendTargetPortal(name, &record, 0, &options, &auth);
+        const bool digestsKept = options.headerDigest != 0 || options.dataDigest != 0;
+        if (status == RM_STATUS_ISCSI_DIGEST_MISMATCH && digestsKept && !digestsAsked) {
+          // The existing portal still carries digests; replace it with one without.
+          NRV_LOG(NRV_DBG, "AddTargetPortal: re-adding the portal without digests");
+          status = LRM_iSCSI_RemoveSendTargetPortal(name, &record);
+          if (status != RM_STATUS_SUCCESS) return status;
+          options.headerDigest = 0;
+          options.dataDigest = 0;
+          status = LRM_iSCSI_AddSendTargetPortal(name, &record, 0, &options, &auth);
+        }
+        return status;
+      });
+  return sanChanged(status, nullptr, false);
 }
 
 RM_STATUS NRV_MethodWrapper::RemoveTargetPortal(const HBA_NAME& name, const std::string& address,
                                                 HBA_UINT16 port) {
-  return withAddress(name, "RemoveTargetPortal", address, port, [&](const RM_IP_ADDRESS& record) {
-    return LRM_iSCSI_RemoveSendTargetPortal(name, &record);
-  });
+  const RM_STATUS status = withAddress(
+      name, "RemoveTargetPortal", address, port,
+      [&](const RM_IP_ADDRESS& record) { return LRM_iSCSI_RemoveSendTargetPortal(name, &record); });
+  return sanChanged(status, "RemoveTargetPortal: Target Portal removed. Refreshing SAN Data.",
+                    true);
 }
 
 RM_STATUS NRV_MethodWrapper::GetTargetPortalProperties(const HBA_NAME& name,
@@ -170,35 +188,41 @@ RM_STATUS NRV_MethodWrapper::AddTarget(const HBA_NAME& name, const std::string& 
                                        const std::string& address, HBA_UINT16 port, bool login,
                                        bool boot, const RM_ISCSI_LOGIN_OPTIONS& options,
                                        const RM_ISCSI_AUTH& auth) {
-  return withAddress(name, "AddTarget", address, port, [&](const RM_IP_ADDRESS& record) {
-    const HBA_UINT32 doLogin = login ? 1 : 0;
-    if (boot)
-      return LRM_iSCSI_AddBootTarget(name, doLogin, target.c_str(), &record, &options, &auth);
-    return LRM_iSCSI_AddTarget(name, doLogin, target.c_str(), &record, &options, &auth);
-  });
+  const RM_STATUS status =
+      withAddress(name, "AddTarget", address, port, [&](const RM_IP_ADDRESS& record) {
+        const HBA_UINT32 doLogin = login ? 1 : 0;
+        if (boot)
+          return LRM_iSCSI_AddBootTarget(name, doLogin, target.c_str(), &record, &options, &auth);
+        return LRM_iSCSI_AddTarget(name, doLogin, target.c_str(), &record, &options, &auth);
+      });
+  return sanChanged(status, "AddTarget: Target added. Refreshing SAN Data.", true);
 }
 
 RM_STATUS NRV_MethodWrapper::RemoveTarget(const HBA_NAME& name, const std::string& target) {
-  return validated(name, "RemoveTarget",
-                   [&] { return LRM_iSCSI_RemoveTarget(name, target.c_str()); });
+  const RM_STATUS status =
+      validated(name, "RemoveTarget", [&] { return LRM_iSCSI_RemoveTarget(name, target.c_str()); });
+  return sanChanged(status, "RemoveTarget: Target removed. Refreshing SAN Data.", true);
 }
 
 RM_STATUS NRV_MethodWrapper::TargetLogin(const HBA_NAME& name, const std::string& target,
                                          const std::string& address, HBA_UINT16 port,
                                          const RM_ISCSI_LOGIN_OPTIONS& options,
                                          const RM_ISCSI_AUTH& auth) {
-  return withAddress(name, "TargetLogin", address, port, [&](const RM_IP_ADDRESS& record) {
-    return LRM_iSCSI_TargetLogin(name, target.c_str(), 0, &record, &options, &auth);
-  });
+  const RM_STATUS status =
+      withAddress(name, "TargetLogin", address, port, [&](const RM_IP_ADDRESS& record) {
+        return LRM_iSCSI_TargetLogin(name, target.c_str(), 0, &record, &options, &auth);
+      });
+  return sanChanged(status, "TargetLogin: Login done. Refreshing SAN Data.", true);
 }
 
 RM_STATUS NRV_MethodWrapper::TargetLogout(const HBA_NAME& name, const std::string& target,
                                           HBA_UINT32 sessionId, const std::string& address) {
-  return validated(name, "TargetLogout", [&] {
+  const RM_STATUS status = validated(name, "TargetLogout", [&] {
     RM_ISCSI_SESSION_ID session;
     if (!makeSession(sessionId, address, session)) return kBadAddress;
     return LRM_iSCSI_TargetLogout(name, target.c_str(), &session);
   });
+  return sanChanged(status, "TargetLogout: Logout done. Refreshing SAN Data.", true);
 }
 
 RM_STATUS NRV_MethodWrapper::SetBootTargetSession(const HBA_NAME& name, const std::string& target,

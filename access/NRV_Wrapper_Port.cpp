@@ -13,8 +13,8 @@ namespace {
 template <class Fn>
 RM_STATUS readRaw(Fn fn, const HBA_NAME& name, std::vector<uint8_t>& record,
                   HBA_UINT32 size = 4096) {
-  return wrapper::readSized(record, size,
-                            [&](void* buffer, HBA_UINT32* length) { return fn(name, buffer, length); });
+  return wrapper::readSized(
+      record, size, [&](void* buffer, HBA_UINT32* length) { return fn(name, buffer, length); });
 }
 
 template <class Fn>
@@ -87,7 +87,8 @@ RM_STATUS NRV_MethodWrapper::GetAdpaterPortConfig(const HBA_NAME& name,
 RM_STATUS NRV_MethodWrapper::SetAdpaterPortConfig(const HBA_NAME& name,
                                                   const std::vector<uint8_t>& record) {
   return validated(name, "SetAdpaterPortConfig", [&]() -> RM_STATUS {
-    if (!wrapper::offers(name, RM_FEATURE_ADAPTER_PORT_CONFIG, "Port configuration is not supported"))
+    if (!wrapper::offers(name, RM_FEATURE_ADAPTER_PORT_CONFIG,
+                         "Port configuration is not supported"))
       return RM_STATUS_ITEM_NOT_OFFERED;
     return writeRaw(LRM_SetAdapterPortConfig, name, record);
   });
@@ -118,8 +119,8 @@ RM_STATUS NRV_MethodWrapper::SetSRIOVEnabledState(const HBA_NAME& name, HBA_UINT
     if (status != RM_STATUS_SUCCESS) return status;
     status = readRaw(LRM_ListProfiles, name, profiles);
     if (status != RM_STATUS_SUCCESS) return status;
-    return setFeatureAttribute(name, RM_FEATURE_SRIOV, "SR-IOV is not supported",
-                               RM_PA_SRIOV_STATE, state);
+    return setFeatureAttribute(name, RM_FEATURE_SRIOV, "SR-IOV is not supported", RM_PA_SRIOV_STATE,
+                               state);
   });
 }
 
@@ -254,7 +255,8 @@ RM_STATUS NRV_MethodWrapper::RestoreWWN(const HBA_NAME& name, HBA_UINT32 type,
                    [&] { return LRM_RestoreWWN(name, type, &operationStatus); });
 }
 
-// ---- Virtual ports and functions -----------------------------------------------------------------
+// ---- Virtual ports and functions
+// -----------------------------------------------------------------
 
 RM_STATUS NRV_MethodWrapper::ListVPorts(const HBA_NAME& name, std::vector<RM_VPORT_ENTRY>& vports) {
   return validated(name, "ListVPorts", [&] {
@@ -266,24 +268,26 @@ RM_STATUS NRV_MethodWrapper::ListVPorts(const HBA_NAME& name, std::vector<RM_VPO
 RM_STATUS NRV_MethodWrapper::ListVPortAttributes(const HBA_NAME& name, const HBA_NAME& vport,
                                                  std::vector<uint8_t>& record) {
   return validated(name, "ListVPortAttributes", [&] {
-    return wrapper::readSized(record, 4096,
-                              [&](void* b, HBA_UINT32* s) { return LRM_VPGetAttributes(name, vport, b, s); });
+    return wrapper::readSized(record, 4096, [&](void* b, HBA_UINT32* s) {
+      return LRM_VPGetAttributes(name, vport, b, s);
+    });
   });
 }
 
 RM_STATUS NRV_MethodWrapper::ListVPortTargets(const HBA_NAME& name, const HBA_NAME& vport,
                                               std::vector<uint8_t>& record) {
   return validated(name, "ListVPortTargets", [&] {
-    return wrapper::readSized(record, 4096,
-                              [&](void* b, HBA_UINT32* s) { return LRM_VPListTargets(name, vport, b, s); });
+    return wrapper::readSized(
+        record, 4096, [&](void* b, HBA_UINT32* s) { return LRM_VPListTargets(name, vport, b, s); });
   });
 }
 
 RM_STATUS NRV_MethodWrapper::ListVMfromVPort(const HBA_NAME& name, const HBA_NAME& vport,
                                              std::vector<uint8_t>& record) {
   return validated(name, "ListVMfromVPort", [&] {
-    return wrapper::readSized(record, 4096,
-                              [&](void* b, HBA_UINT32* s) { return LRM_GetVMFromVPort(name, vport, b, s); });
+    return wrapper::readSized(record, 4096, [&](void* b, HBA_UINT32* s) {
+      return LRM_GetVMFromVPort(name, vport, b, s);
+    });
   });
 }
 
@@ -291,7 +295,8 @@ RM_STATUS NRV_MethodWrapper::GetVMInfo(const HBA_NAME& name, std::vector<uint8_t
   return validated(name, "GetVMInfo", [&] { return readRaw(LRM_GetVMInfo, name, record); });
 }
 
-RM_STATUS NRV_MethodWrapper::GetVirtualFuncList(const HBA_NAME& name, std::vector<uint8_t>& record) {
+RM_STATUS NRV_MethodWrapper::GetVirtualFuncList(const HBA_NAME& name,
+                                                std::vector<uint8_t>& record) {
   return validated(name, "GetVirtualFuncList",
                    [&] { return readRaw(LRM_GetVirtualFunctionList, name, record); });
 }

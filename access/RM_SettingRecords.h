@@ -13,10 +13,10 @@
 // LRM_CNA_FCOE_GetFCFConnectList / SetFCFConnectList.
 enum : HBA_UINT32 { RM_FCF_CONNECT_VLAN_VALID = 0x20 };
 struct RM_FCF_CONNECT_LIST {
-  HBA_NAME fabricName;   //  0
-  HBA_NAME switchName;   //  8
-  HBA_UINT32 flags;      // 16 RM_FCF_CONNECT_VLAN_VALID: vlanId holds the VLAN
-  HBA_UINT16 vlanId;     // 20
+  HBA_NAME fabricName;  //  0
+  HBA_NAME switchName;  //  8
+  HBA_UINT32 flags;     // 16 RM_FCF_CONNECT_VLAN_VALID: vlanId holds the VLAN
+  HBA_UINT16 vlanId;    // 20
   HBA_UINT8 reserved[2];
 };
 static_assert(sizeof(RM_FCF_CONNECT_LIST) == 24);
@@ -42,7 +42,7 @@ enum : HBA_UINT32 {
   RM_CEE_ROCE_PRIORITY = 7,
 };
 struct RM_CEE_ITEM {
-  HBA_UINT32 item;   // RM_CEE_*
+  HBA_UINT32 item;  // RM_CEE_*
   HBA_UINT32 value;
 };
 static_assert(sizeof(RM_CEE_ITEM) == 8);

@@ -3,11 +3,10 @@
 // digest mismatch, FIP texts, CEE parameter routing, feature gates, growing
 // lists and lists that claim more than they hold.
 #include <dlfcn.h>
+#include <gtest/gtest.h>
 
 #include <string>
 #include <vector>
-
-#include <gtest/gtest.h>
 
 #include "TestSupport.h"
 #include "access/NRV_MethodWrapper.h"
@@ -128,13 +127,15 @@ TEST_F(StubLibrary, DISABLED_ISNSUpdatePingsAddsThenEnables) {
   // A silent server is still added, with a warning.
   EXPECT_EQ(0u, NRV_MethodWrapper::UpdateiSNSServer(local(), "172.16.0.1", 3205, 0));
   EXPECT_EQ("ping 172 3205;addisns 172 3205;isnsstate 0 0;", m_calls());
-  EXPECT_EQ(1, m_log.count("iSNS server has been updated, but IP address is unreachable", NRV_WARN));
+  EXPECT_EQ(1,
+            m_log.count("iSNS server has been updated, but IP address is unreachable", NRV_WARN));
 
   // A refused add leaves the iSNS state alone and reports the library's status.
   EXPECT_EQ(33u, NRV_MethodWrapper::UpdateiSNSServer(local(), "192.168.0.1", 3205, 1));
   EXPECT_EQ("ping 192 3205;addisns 192 3205;", m_calls());
 
-  EXPECT_EQ(NRV_MethodWrapper::kBadAddress, NRV_MethodWrapper::UpdateiSNSServer(local(), "", 3205, 1));
+  EXPECT_EQ(NRV_MethodWrapper::kBadAddress,
+            NRV_MethodWrapper::UpdateiSNSServer(local(), "", 3205, 1));
   EXPECT_EQ("", m_calls());
 }
 
@@ -160,7 +161,8 @@ TEST_F(StubLibrary, DISABLED_PortalWithStaleDigestsIsReAddedOnce) {
 
 TEST_F(StubLibrary, DISABLED_LogoutNamesTheTargetAddressOnlyWhenGiven) {
   EXPECT_EQ(0u, NRV_MethodWrapper::TargetLogout(local(), "iqn.2001-05.com.example:t1", 17, ""));
-  EXPECT_EQ(0u, NRV_MethodWrapper::TargetLogout(local(), "iqn.2001-05.com.example:t1", 18, "10.1.1.1"));
+  EXPECT_EQ(0u,
+            NRV_MethodWrapper::TargetLogout(local(), "iqn.2001-05.com.example:t1", 18, "10.1.1.1"));
   EXPECT_EQ("logout 17 0;logout 18 1;", m_calls());
   // The session record holds an IPv4 address only.
   EXPECT_EQ(NRV_MethodWrapper::kBadAddress,
@@ -213,10 +215,12 @@ TEST_F(StubLibrary, DISABLED_CEEParametersGoToTheirOwnWriter) {
     const char* key;
     const char* call;
   } routes[] = {
-      {"dcbxstate", "dcbx 1 5;"},     {"txstate", "lldp 2 5;"},     {"rxstate", "lldp 3 5;"},
-      {"txportdesc", "tlv 4 5;"},     {"txsysdesc", "tlv 6 5;"},    {"txsysname", "tlv 5 5;"},
-      {"txsyscap", "tlv 7 5;"},       {"pfcenabled", "pfc 8 4;"},   {"fcoepriority", "pgsetting 5 5;"},
-      {"iscsipriority", "pgsetting 6 5;"}, {"rocepriority", "pgsetting 7 5;"},
+      {"dcbxstate", "dcbx 1 5;"},         {"txstate", "lldp 2 5;"},
+      {"rxstate", "lldp 3 5;"},           {"txportdesc", "tlv 4 5;"},
+      {"txsysdesc", "tlv 6 5;"},          {"txsysname", "tlv 5 5;"},
+      {"txsyscap", "tlv 7 5;"},           {"pfcenabled", "pfc 8 4;"},
+      {"fcoepriority", "pgsetting 5 5;"}, {"iscsipriority", "pgsetting 6 5;"},
+      {"rocepriority", "pgsetting 7 5;"},
   };
   for (const auto& r : routes) {
     EXPECT_EQ(0u, NRV_MethodWrapper::nrvcimSetCEEParams(local(), r.key, 5)) << r.key;
@@ -230,7 +234,8 @@ TEST_F(StubLibrary, DISABLED_MissingFeaturesAnswerNotSupported) {
   // The stub offers neither priority groups (400) nor channel management (435).
   const RM_PG_PRIORITY_BITMAPS groups{};
   const RM_PG_BANDWIDTH bandwidth{};
-  EXPECT_EQ(NRV_MethodWrapper::kNotSupported, NRV_MethodWrapper::nrvcimSetCeePriority(local(), groups, 0));
+  EXPECT_EQ(NRV_MethodWrapper::kNotSupported,
+            NRV_MethodWrapper::nrvcimSetCeePriority(local(), groups, 0));
   EXPECT_EQ(NRV_MethodWrapper::kNotSupported, NRV_MethodWrapper::nrvcimSetPgBW(local(), bandwidth));
   EXPECT_EQ(NRV_MethodWrapper::kNotSupported, NRV_MethodWrapper::SetCMMode(local(), 2));
   EXPECT_EQ("", m_calls());
@@ -278,4 +283,24 @@ TEST_F(StubLibrary, DISABLED_LibraryVersionsByCode) {
   EXPECT_EQ("12.4.270.9", rmapi);
   EXPECT_EQ("dfc 5.2", dfc);
   EXPECT_EQ("3.1", tiro);
+}
+
+namespace {
+std::vector<bool> g_sanChanges;
+void recordSanChange(bool rebuildNow) { g_sanChanges.push_back(rebuildNow); }
+}  // namespace
+
+TEST_F(StubLibrary, DISABLED_SanChangesReachTheirHandlerOnlyOnSuccess) {
+  g_sanChanges.clear();
+  NRV_MethodWrapper::setSanChangeHandler(recordSanChange);
+  EXPECT_EQ(0u, NRV_MethodWrapper::TargetLogout(local(), "iqn.2001-05.com.example:t1", 1, ""));
+  EXPECT_EQ(1, m_log.count("TargetLogout: Logout done. Refreshing SAN Data.", NRV_DBG));
+  RM_ISCSI_LOGIN_OPTIONS options{};
+  const RM_ISCSI_AUTH auth{};
+  EXPECT_EQ(0u, NRV_MethodWrapper::AddTargetPortal(local(), "10.0.0.9", 3260, options, auth));
+  // Not in the stub: the forwarder's failure changes nothing.
+  EXPECT_EQ(1u, NRV_MethodWrapper::RemoveTarget(local(), "iqn.2001-05.com.example:t1"));
+  EXPECT_EQ(0, m_log.count("RemoveTarget: Target removed. Refreshing SAN Data."));
+  EXPECT_EQ((std::vector<bool>{true, false}), g_sanChanges);
+  NRV_MethodWrapper::setSanChangeHandler(nullptr);
 }
