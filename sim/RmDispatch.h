@@ -43,7 +43,13 @@ NRV_RM_PAIRED_FUNCTIONS(NRVSIM_SIG_)
   X(DeleteDumpFiles) X(RetrieveFATDump) X(RetrieveFATDump2) X(iSCSI_AddBootTarget)         \
   X(iSCSI_SetBootSession) X(iSCSI_GetTargetLoginAuthProperties)                              \
   X(iSCSI_SetTargetLoginAuthProperties) X(iSCSI_SetTargetProperties)                         \
-  X(iSCSI_GetSendTargetPortalProperties) X(iSCSI_SetSendTargetPortalProperties) X(Ping)
+  X(iSCSI_GetSendTargetPortalProperties) X(iSCSI_SetSendTargetPortalProperties) X(Ping)      \
+  X(CNA_FCOE_GetFIPParams) X(CNA_FCOE_SetFIPParams) X(CNA_FCOE_GetFCFConnectList)            \
+  X(CNA_FCOE_SetFCFConnectList) X(CNA_FCOE_GetFcfList) X(CNA_GetCEE_Params)                  \
+  X(CNA_GetPGPriorityBitmaps) X(CNA_SetPGPriorityBitmaps) X(CNA_SetPGPriorityBitmapsExt)     \
+  X(CNA_SetPGBandwidth) X(CNA_SetPFC) X(CNA_SetDcbxPortVars) X(CNA_SetLldp)                  \
+  X(CNA_SetPGSetting) X(CNA_SetTLV) X(CNA_GetTLV) X(GetQoS) X(SetQoS) X(SetAdapterAttribute) \
+  X(SetBootBiosState) X(SetNetbootParams) X(SetPhyPortSpeedSettings) X(GetServerAttributes)
 
 template <class Tag>
 struct Dispatch {

@@ -360,6 +360,8 @@ Function read_function(const Node& n, const Card& card) {
     f.wwnn = n.has("wwnn") ? n.wwn("wwnn") : f.id;
     f.fc_id = n.u32("fc_id", 0);
     f.fabric = n.has("fabric") ? n.wwn("fabric") : Wwn{};
+    f.fip.fcf_vlan = n.u16("fcoe_vlan", 1002);
+    if (f.fip.fcf_vlan == 0 || f.fip.fcf_vlan > 4094) n.at("fcoe_vlan").fail("VLAN must be 1 to 4094");
   } else {
     f.id = n.has("identifier") ? n.wwn("identifier") : wwn_from_mac(f.mac);
   }
@@ -538,6 +540,7 @@ LoadResult load_site_text(const std::string& text, const std::string& origin) {
       loaded.site.library.global_driver_params = read_params(lib, "driver_params");
       loaded.site.library.dump_directory = lib.str("dump_directory", loaded.site.library.dump_directory);
       loaded.site.library.dump_retention = lib.u32("dump_retention", loaded.site.library.dump_retention);
+      loaded.site.library.target_os = lib.str("target_os", loaded.site.library.target_os);
     }
     for (const Node& c : root.items("cards")) loaded.site.cards.push_back(read_card(c));
     for (const Node& f : root.items("faults")) loaded.faults.push_back(read_fault(f));

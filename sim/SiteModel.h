@@ -141,6 +141,32 @@ struct SffData {
       rx_thresholds{};
 };
 
+// Data-centre bridging state of a physical port.
+struct DcbSettings {
+  uint32_t dcbx_state = 1, lldp_tx = 1, lldp_rx = 1, pfc_enabled = 1;
+  uint32_t fcoe_priority = 3, iscsi_priority = 4, roce_priority = 5;
+  std::array<uint32_t, 4> tlv_transmit{1, 1, 1, 1};  // port description, system name, description, capabilities
+  std::array<uint8_t, 8> groups{0x07, 0x08, 0x10, 0x20, 0x40, 0x80, 0x00, 0x00};  // priorities per group
+  uint8_t group15 = 0;
+  uint8_t pfc_bitmap = 0x18;
+  std::array<uint8_t, 8> bandwidth{40, 30, 10, 10, 10, 0, 0, 0};  // percent per group
+};
+
+// FCoE initialization protocol state of an FCoE function.
+struct FipSettings {
+  std::array<uint8_t, 3> fc_map{0x0E, 0xFC, 0x00};
+  uint32_t cin_vlan = 0;
+  Wwn connect_fabric{}, connect_switch{};
+  uint32_t connect_flags = 0;
+  uint16_t connect_vlan = 0;
+  uint16_t fcf_vlan = 1002;  // VLAN the fabric's FCF announces
+  Mac fcf_mac{{0x00, 0x05, 0x73, 0xa1, 0x0b, 0x20}};
+};
+
+struct QosLimits {
+  uint32_t max_bytes_per_second = 0, max_ios_per_second = 0, max_bits_per_second = 0;
+};
+
 struct PhysicalPort {
   bool link_up = true;
   uint32_t speed_mbps = 10000;
@@ -149,6 +175,7 @@ struct PhysicalPort {
   bool enabled = true;
   uint32_t beacon = 2;     // library beacon state: 2 off, 3 on (1: not available)
   uint32_t cable_nvp = 69; // nominal velocity of propagation, percent
+  DcbSettings dcb;
   bool is_10gbaset = false;
   SffData sff;
 };
@@ -182,6 +209,8 @@ struct Function {
   IscsiInitiator initiator;
   std::vector<IscsiTarget> iscsi_targets;
   std::string hba_name;  // HBA API adapter name (FCoE), set by the loader
+  FipSettings fip;
+  QosLimits qos;
 };
 
 struct Firmware {
@@ -207,6 +236,7 @@ struct LibraryInfo {
   uint32_t init_status = 0;
   std::vector<DriverParam> global_driver_params;
   std::string dump_directory = "/var/crash/norvane";
+  std::string target_os = "Linux";
   uint32_t dump_retention = 10;
 };
 

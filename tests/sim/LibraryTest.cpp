@@ -139,7 +139,7 @@ TEST_F(ManagementLibrary, UnknownNameAndUnofferedOperation) {
   EXPECT_EQ(SIM_CALL(lrmapi(), RM_IsLocalHBA, nobody, &local), 0u);
   EXPECT_EQ(local, 0u);
   HBA_UINT32 qsize = 64;
-  EXPECT_EQ(SIM_CALL(lrmapi(), LRM_GetQoS, first_of(RM_PROTOCOL_NIC), blob.data(), &qsize),
+  EXPECT_EQ(SIM_CALL(lrmapi(), LRM_GetVMInfo, first_of(RM_PROTOCOL_NIC), blob.data(), &qsize),
             RM_STATUS_ITEM_NOT_OFFERED);
   EXPECT_EQ(SIM_CALL(lrmapi(), NrvGetBoardNumber, nobody), -1);
   EXPECT_EQ(SIM_CALL(lrmapi(), NrvGetBoardNumber, functions().back().wwpn), 1);
