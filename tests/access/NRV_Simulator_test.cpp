@@ -1,7 +1,11 @@
 // The loader and the method wrapper against the simulated adapter site
-// (LD_LIBRARY_PATH = the simulator's library directory).
+// (LD_LIBRARY_PATH = the simulator's library directory): operations whose
+// effect the library keeps, read back through the wrapper.
 #include <gtest/gtest.h>
 
+#include <cstring>
+#include <memory>
+#include <string>
 #include <vector>
 
 #include "TestSupport.h"
@@ -9,6 +13,7 @@
 #include "access/NRV_Runtime_Loader.h"
 
 using namespace cimple;
+using nrv_test::LogCapture;
 
 TEST(Simulator, WrapperOperationsReachTheSimulatedLibrary) {
   ASSERT_EQ(0, NRV_Runtime_Loader::loadLibraries());
@@ -44,4 +49,138 @@ TEST(Simulator, WrapperOperationsReachTheSimulatedLibrary) {
     EXPECT_EQ(1, NRV_MethodWrapper::Validatewwpn(stranger));
   }
   EXPECT_EQ(0, NRV_Runtime_Loader::unloadLibraries());
+}
+
+namespace {
+
+// The simulated site with the wrapper constructed; functions by protocol.
+class SimulatedSite : public ::testing::Test {
+ protected:
+  void SetUp() override {
+    ASSERT_EQ(0, NRV_Runtime_Loader::loadLibraries());
+    m_wrapper = std::make_unique<NRV_MethodWrapper>();
+    HBA_UINT32 count = 64;
+    std::vector<HBA_UINT32> instances(count);
+    ASSERT_EQ(0u, RM_GetAllLocalHBAInstances(&count, instances.data()));
+    for (HBA_UINT32 i = 0; i < count; ++i) {
+      RM_ADAPTER_INSTANCE pair{0, instances[i]};
+      RM_LOCAL_HBA_INFO_V4 info{};
+      if (RM_GetLocalHBAInfoV4(&pair, &info) == 0) m_functions.push_back(info);
+    }
+  }
+  void TearDown() override {
+    m_wrapper.reset();
+    NRV_Runtime_Loader::unloadLibraries();
+  }
+  // The first function carrying `protocol`; skips the test when there is none.
+  bool find(HBA_UINT32 protocol, HBA_NAME& name, size_t skip = 0) {
+    for (const auto& f : m_functions)
+      if ((f.protocolMask & protocol) != 0 && skip-- == 0) {
+        name = f.wwpn;
+        return true;
+      }
+    return false;
+  }
+  std::unique_ptr<NRV_MethodWrapper> m_wrapper;
+  std::vector<RM_LOCAL_HBA_INFO_V4> m_functions;
+  LogCapture m_log;
+};
+
+bool holds(const std::vector<RM_IP_ADDRESS>& list, const RM_IP_ADDRESS& a) {
+  for (const auto& e : list)
+    if (std::memcmp(e.address, a.address, sizeof a.address) == 0 && e.port == a.port) return true;
+  return false;
+}
+
+}  // namespace
+
+TEST_F(SimulatedSite, ISNSServerAddedListedAndDeleted) {
+  HBA_NAME port;
+  if (!find(RM_PROTOCOL_ISCSI, port)) GTEST_SKIP() << "no iSCSI function in the site";
+  RM_IP_ADDRESS server;
+  ASSERT_TRUE(NRV_MethodWrapper::makeAddress("10.9.8.7", 3205, server));
+  // The simulated library does not ping: the server is added all the same.
+  EXPECT_EQ(0u, NRV_MethodWrapper::UpdateiSNSServer(port, "10.9.8.7", 3205, 1));
+  EXPECT_EQ(1, m_log.count("iSNS server has been updated, but IP address is unreachable", NRV_WARN));
+  std::vector<RM_IP_ADDRESS> servers;
+  ASSERT_EQ(0u, NRV_MethodWrapper::GetiSNSServer(port, servers));
+  EXPECT_TRUE(holds(servers, server));
+  // The library refuses the same server twice.
+  EXPECT_NE(0u, NRV_MethodWrapper::UpdateiSNSServer(port, "10.9.8.7", 3205, 1));
+  EXPECT_EQ(0u, NRV_MethodWrapper::DeleteiSNSServer(port, "10.9.8.7", 3205));
+  ASSERT_EQ(0u, NRV_MethodWrapper::GetiSNSServer(port, servers));
+  EXPECT_FALSE(holds(servers, server));
+  EXPECT_NE(0u, NRV_MethodWrapper::DeleteiSNSServer(port, "10.9.8.7", 3205));
+}
+
+TEST_F(SimulatedSite, DumpFilesFollowTheRetentionCount) {
+  HBA_NAME port;
+  if (!find(~0u, port)) GTEST_SKIP() << "no function in the site";
+  ASSERT_EQ(0u, NRV_MethodWrapper::nrvcimDeleteDumpFiles(port));
+  ASSERT_EQ(0u, NRV_MethodWrapper::SetRetentionCount(port, 6));
+  HBA_UINT32 count = 0;
+  ASSERT_EQ(0u, NRV_MethodWrapper::nrvcimGetRetentionCount(port, count));
+  EXPECT_EQ(6u, count);
+  for (int i = 0; i < 7; ++i) ASSERT_EQ(0u, NRV_MethodWrapper::nrvcimDumpDiagnostic(port, i % 2));
+  ASSERT_EQ(0u, NRV_MethodWrapper::nrvcimDumpDiagnostic(port, -1));
+  // More names than the first request has room for.
+  std::vector<std::string> files;
+  ASSERT_EQ(0u, NRV_MethodWrapper::GetDumpFileNames(port, files));
+  ASSERT_EQ(6u, files.size());
+  EXPECT_NE(std::string::npos, files.back().find("_fat_"));
+  ASSERT_EQ(0u, NRV_MethodWrapper::nrvcimDeleteDumpFiles(port));
+  ASSERT_EQ(0u, NRV_MethodWrapper::GetDumpFileNames(port, files));
+  EXPECT_TRUE(files.empty());
+}
+
+TEST_F(SimulatedSite, DriverParameterChangeIsReadBack) {
+  HBA_NAME port;
+  if (!find(RM_PROTOCOL_FCOE, port)) GTEST_SKIP() << "no FCoE function in the site";
+  std::vector<RM_DRIVER_PARAM> params;
+  ASSERT_EQ(0u, NRV_MethodWrapper::ReadDriverParams(port, false, params));
+  ASSERT_FALSE(params.empty());
+  const RM_DRIVER_PARAM& first = params.front();
+  const std::string name(first.name, strnlen(first.name, sizeof first.name));
+  ASSERT_FALSE(name.empty());
+  const HBA_UINT32 wanted = first.currentValue == first.minValue ? first.maxValue : first.minValue;
+  ASSERT_EQ(0u, NRV_MethodWrapper::nrvcimSetDriverParam(port, false, true, name,
+                                                        std::to_string(wanted)));
+  ASSERT_EQ(0u, NRV_MethodWrapper::ReadDriverParams(port, false, params));
+  EXPECT_EQ(wanted, params.front().currentValue);
+  std::vector<RM_DRIVER_PARAM> global;
+  EXPECT_EQ(0u, NRV_MethodWrapper::ReadDriverParams(port, true, global));
+}
+
+TEST_F(SimulatedSite, VitalProductDataWalk) {
+  HBA_NAME port;
+  if (!find(~0u, port)) GTEST_SKIP() << "no function in the site";
+  std::vector<std::pair<std::string, std::string>> entries;
+  ASSERT_EQ(0u, NRV_MethodWrapper::ReadVPD(port, entries));
+  ASSERT_FALSE(entries.empty());
+  for (const auto& e : entries) EXPECT_FALSE(e.first.empty());
+}
+
+TEST_F(SimulatedSite, NamesInUseAreRefusedBeforeTheLibraryIsAsked) {
+  HBA_NAME port;
+  if (!find(RM_PROTOCOL_FCOE, port)) GTEST_SKIP() << "no FCoE function in the site";
+  // Another function whose name would pass as a world-wide name of its own.
+  const RM_LOCAL_HBA_INFO_V4* other = nullptr;
+  for (const auto& f : m_functions)
+    if (std::memcmp(&f.wwpn, &port, sizeof port) != 0 && RM_ValidateWwn(f.wwpn) == 0) other = &f;
+  if (other == nullptr) GTEST_SKIP() << "no second function with a world-wide name";
+  HBA_NAME wwpn{}, wwnn{};
+  HBA_UINT32 op = 0;
+  ASSERT_EQ(0u, NRV_MethodWrapper::ReadWWN(port, 3, wwpn, wwnn, op));
+  EXPECT_EQ(0, std::memcmp(&wwpn, &port, sizeof port));
+  // Another function's port name.
+  EXPECT_EQ(kNrvFailure, NRV_MethodWrapper::ChangeWWN(port, 0, other->wwpn, wwnn, op));
+  EXPECT_EQ(1, m_log.count("ChangeWWN: Duplication of vport WWPN detected.", NRV_ERR));
+  // A name the library does not accept.
+  const HBA_NAME zero{};
+  EXPECT_EQ(kNrvFailure, NRV_MethodWrapper::ChangeWWN(port, 0, zero, wwnn, op));
+  EXPECT_EQ(1, m_log.count("The supplied 'New WWPN' is not valid", NRV_ERR));
+  // The port keeps its name.
+  HBA_NAME now{}, node{};
+  ASSERT_EQ(0u, NRV_MethodWrapper::ReadWWN(port, 3, now, node, op));
+  EXPECT_EQ(0, std::memcmp(&now, &port, sizeof port));
 }
