@@ -184,12 +184,17 @@ class NRV_MethodWrapper {
                                         HBA_UINT32 enable);
   static RM_STATUS SetTargetProperties(const HBA_NAME& name, const std::string& target,
                                        RM_ISCSI_TARGET_PROPERTIES& properties);
-  // Raw lists: targets (count + 516-byte entries), a target's LUNs, a
-  // session's information, the port's iSCSI statistics.
+  // Raw lists: targets (count + 516-byte entries), a target's LUNs and
+  // sessions, a LUN's properties, a session's information, the port's iSCSI
+  // statistics.
   static RM_STATUS GetiSCSITargetList(const HBA_NAME& name, HBA_UINT8 flag,
                                       std::vector<uint8_t>& list);
   static RM_STATUS GetiSCSILuns(const HBA_NAME& name, const std::string& target,
                                 std::vector<uint8_t>& luns);
+  static RM_STATUS GetiSCSISessions(const HBA_NAME& name, const std::string& target,
+                                    std::vector<uint8_t>& sessions);
+  static RM_STATUS GetiSCSILunProperties(const HBA_NAME& name, const std::string& target,
+                                         HBA_UINT32 lun, std::vector<uint8_t>& properties);
   static RM_STATUS GetSessionInfo(const HBA_NAME& name, const void* session,
                                   std::vector<uint8_t>& info);
   static RM_STATUS GetIscsiPortStatistics(const HBA_NAME& name, std::vector<uint8_t>& statistics);

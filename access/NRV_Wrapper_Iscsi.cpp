@@ -273,6 +273,25 @@ RM_STATUS NRV_MethodWrapper::GetiSCSILuns(const HBA_NAME& name, const std::strin
   });
 }
 
+RM_STATUS NRV_MethodWrapper::GetiSCSISessions(const HBA_NAME& name, const std::string& target,
+                                              std::vector<uint8_t>& sessions) {
+  return validated(name, "GetiSCSISessions", [&] {
+    return wrapper::readSized(sessions, 4096, [&](void* buffer, HBA_UINT32* size) {
+      return LRM_iSCSI_GetSessions(name, target.c_str(), buffer, size);
+    });
+  });
+}
+
+RM_STATUS NRV_MethodWrapper::GetiSCSILunProperties(const HBA_NAME& name, const std::string& target,
+                                                   HBA_UINT32 lun,
+                                                   std::vector<uint8_t>& properties) {
+  return validated(name, "GetiSCSILunProperties", [&] {
+    return wrapper::readSized(properties, 1024, [&](void* buffer, HBA_UINT32* size) {
+      return LRM_iSCSI_GetLunProperties(name, target.c_str(), lun, buffer, size);
+    });
+  });
+}
+
 RM_STATUS NRV_MethodWrapper::GetSessionInfo(const HBA_NAME& name, const void* session,
                                             std::vector<uint8_t>& info) {
   return validated(name, "GetSessionInfo", [&] {

@@ -184,3 +184,39 @@ TEST_F(SimulatedSite, NamesInUseAreRefusedBeforeTheLibraryIsAsked) {
   ASSERT_EQ(0u, NRV_MethodWrapper::ReadWWN(port, 3, now, node, op));
   EXPECT_EQ(0, std::memcmp(&now, &port, sizeof port));
 }
+
+namespace {
+std::vector<bool> g_sanChanges;
+void recordSanChange(bool rebuildNow) { g_sanChanges.push_back(rebuildNow); }
+
+HBA_UINT32 targetCount(const HBA_NAME& port) {
+  std::vector<uint8_t> list;
+  if (NRV_MethodWrapper::GetiSCSITargetList(port, 0, list) != 0 || list.size() < 4) return ~0u;
+  HBA_UINT32 count = 0;
+  std::memcpy(&count, list.data(), sizeof count);
+  return count;
+}
+}  // namespace
+
+TEST_F(SimulatedSite, StaticTargetAddedAndRemovedTellsTheCatalogue) {
+  HBA_NAME port;
+  if (!find(RM_PROTOCOL_ISCSI, port)) GTEST_SKIP() << "no iSCSI function in the site";
+  const std::string target = "iqn.2026-12.com.norvane:wrapper-test";
+  const HBA_UINT32 before = targetCount(port);
+  ASSERT_NE(~0u, before);
+  g_sanChanges.clear();
+  NRV_MethodWrapper::setSanChangeHandler(recordSanChange);
+  const RM_ISCSI_LOGIN_OPTIONS options{};
+  const RM_ISCSI_AUTH auth{};
+  ASSERT_EQ(0u, NRV_MethodWrapper::AddTarget(port, target, "10.20.30.40", 3260, false, false,
+                                             options, auth));
+  EXPECT_EQ(before + 1, targetCount(port));
+  EXPECT_EQ(0u, NRV_MethodWrapper::RemoveTarget(port, target));
+  EXPECT_EQ(before, targetCount(port));
+  // Gone already: the library's refusal reaches no one.
+  EXPECT_NE(0u, NRV_MethodWrapper::RemoveTarget(port, target));
+  NRV_MethodWrapper::setSanChangeHandler(nullptr);
+  EXPECT_EQ((std::vector<bool>{true, true}), g_sanChanges);
+  EXPECT_EQ(1, m_log.count("AddTarget: Target added. Refreshing SAN Data."));
+  EXPECT_EQ(1, m_log.count("RemoveTarget: Target removed. Refreshing SAN Data."));
+}
