@@ -5,7 +5,15 @@
 // Contract: the provider agent owns the single instance and constructs it
 // before any other management call; construction throws std::runtime_error
 // when LRM_InitLib fails.  The static operations keep no state of their own
-// and may run on any thread.  The runtime loader must have been started.
+// (apart from the SAN-change handler) and may run on any thread.  The runtime
+// loader must have been started.
+//
+// Statuses: 0 success; 1 when the port name is not a local adapter (the
+// library is not called); kNrvFailure for a malformed argument the wrapper
+// checks itself; 190 when the adapter lacks the feature an operation needs
+// (2 for the FIP, priority-group and channel-management operations); any
+// other value is the library's.  Records whose layout belongs to the caller
+// come back as bytes, at most as many as the library reported.
 #pragma once
 
 #include <semaphore.h>
