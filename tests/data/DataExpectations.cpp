@@ -135,7 +135,7 @@ void expectAdapters(const Data& data, const std::vector<Function>& functions,
     fcoe |= f.kind == "fcoe";
     EXPECT_EQ(a->getAdapterType(), adapterTypeOf(f.kind));
     EXPECT_EQ(a->getAdapterName(), expectedName(f));
-    EXPECT_EQ(a->getAdapterNumber(), i);
+    EXPECT_EQ(a->getAdapterNumber(), f.index);
     EXPECT_EQ(a->getReserved(), 0u);
     EXPECT_EQ(a->getIdentifierText(), f.identifier);
     EXPECT_NE(a->getStatistics(), nullptr);

@@ -12,8 +12,8 @@
 
 namespace nrv_data_test {
 
-// Every function of the site is an adapter of the right kind, name, number and
-// identifier, in enumeration order; each has one port named by its identifier
+// Every function listed is an adapter of the right kind, name, number and
+// identifier, in enumeration order (and no other adapter exists); each has one port named by its identifier
 // whose attribute sets hold the site's values, except the adapters whose
 // identifier is in `portless`, which have no ports.
 void expectAdapters(const cimple::Data& data, const std::vector<Function>& functions,

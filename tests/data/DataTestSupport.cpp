@@ -48,6 +48,7 @@ std::vector<Function> functionsOf(const json& site) {
       fn.serial = card.at("serial").get<std::string>();
       fn.manufacturer = card.value("manufacturer", "Norvane");
       fn.pciFunction = f.value("pci_function", 0u);
+      fn.index = static_cast<uint32_t>(out.size());
       fn.mac = f.at("mac").get<std::string>();
       // The simulator names FCoE functions by their WWPN, the others by an
       // explicit identifier or their MAC followed by two zero bytes.

@@ -31,6 +31,7 @@ struct Function {
   std::string kind;  // "nic", "iscsi", "fcoe"
   std::string model, serial, manufacturer;
   uint32_t pciFunction = 0;
+  uint32_t index = 0;      // position in the library's enumeration
   std::string identifier;  // 16 upper-case hex digits
   std::string mac;         // as the site writes it
   std::string wwnn;        // FCoE: 16 upper-case hex digits

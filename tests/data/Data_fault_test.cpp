@@ -125,6 +125,45 @@ TEST(FaultedSite, MappingLargerThanTheFirstBuffer) {
             0);
 }
 
+TEST(FaultedSite, PortStatisticsThatCannotBeReadKeepTheOldObject) {
+  EXPECT_EQ(runScenario("PortStatisticsFail",
+                        [](json& site, const std::vector<Function>& fns) {
+                          // The first FCoE port reads once, then fails; the
+                          // second never reads.
+                          addFault(site, {{"function", "RM_GetPortStatistics"},
+                                          {"status", 5},
+                                          {"call", 2},
+                                          {"count", 1000},
+                                          {"adapter", nthFcoe(fns, 0).identifier}});
+                          addFault(site, {{"function", "RM_GetPortStatistics"},
+                                          {"status", 5},
+                                          {"adapter", nthFcoe(fns, 1).identifier}});
+                        }),
+            0);
+}
+
+TEST(FaultedSite, InformationRecordFallsBackToV3) {
+  EXPECT_EQ(runScenario("InformationV3Fallback",
+                        [](json& site, const std::vector<Function>&) {
+                          // 190 (not offered) is not worth a message.
+                          addFault(site, {{"function", "RM_GetLocalHBAInfoV4"}, {"status", 190}});
+                        }),
+            0);
+}
+
+TEST(FaultedSite, InformationRecordMissingSkipsThatFunction) {
+  EXPECT_EQ(runScenario("InformationMissing",
+                        [](json& site, const std::vector<Function>& fns) {
+                          // Call 1 is the scanning pass's; call 2 + i reads
+                          // function i in the building pass.
+                          const uint32_t i = nthFcoe(fns, 0).index;
+                          addFault(site, {{"function", "RM_GetLocalHBAInfoV4"}, {"status", 5}, {"call", 2 + i}});
+                          addFault(site, {{"function", "RM_GetLocalHBAInfoV3"}, {"status", 6}, {"call", 1}});
+                          site["skipped_for_test"] = i;
+                        }),
+            0);
+}
+
 TEST(FaultedSite, NoNicFunctionMeansNoAdapters) {
   EXPECT_EQ(runScenario("NoNicFunction",
                         [](json& site, const std::vector<Function>&) {
@@ -279,6 +318,49 @@ TEST_F(FaultedSiteChild, DISABLED_LargeTargetMapping) {
     if (f.kind == "fcoe" && entries == 0) entries = f.luns.size();
   ASSERT_GT(entries, 256u);
   EXPECT_EQ(log.count("Increasing the buffer to = " + std::to_string(entries)), 1);
+}
+
+TEST_F(FaultedSiteChild, DISABLED_PortStatisticsFail) {
+  data.buildAdapterData();
+  cimple::Port* reads = nullptr;
+  cimple::Port* never = nullptr;
+  for (const auto& adapter : data.getAdapters()) {
+    if (adapter->getAdapterType() != cimple::kFCoEAdapterType) continue;
+    (reads == nullptr ? reads : never) = adapter->getPort(0);
+  }
+  ASSERT_NE(never, nullptr);
+  const cimple::PortStatistics* first = reads->getStatistics();
+  ASSERT_NE(first, nullptr);
+  const uint64_t counter = first->counter(1);
+  EXPECT_EQ(reads->getStatistics(), first);
+  EXPECT_EQ(first->counter(1), counter);
+  EXPECT_EQ(never->getStatistics(), nullptr);
+  EXPECT_EQ(log.count("ERROR: RM_GetPortStatistics call failed (5)", cimple::NRV_ERR), 2);
+  EXPECT_EQ(log.count("FCoE Port statistics error occurred,retain the old statistics !!!",
+                      cimple::NRV_ERR),
+            2);
+}
+
+TEST_F(FaultedSiteChild, DISABLED_InformationV3Fallback) {
+  data.buildAdapterData();
+  expectAdapters(data, functions);
+  EXPECT_EQ(log.countPrefix("ERROR: RM_GetLocalHBAInfoV4 failed"), 0);
+}
+
+TEST_F(FaultedSiteChild, DISABLED_InformationMissing) {
+  const uint32_t skipped = site["skipped_for_test"].get<uint32_t>();
+  data.buildAdapterData();
+  std::vector<Function> rest = functions;
+  rest.erase(rest.begin() + skipped);
+  expectAdapters(data, rest);
+  EXPECT_EQ(log.count("ERROR: RM_GetLocalHBAInfoV4 failed for adapter " + std::to_string(skipped) +
+                      ". status = 5"),
+            1);
+  EXPECT_EQ(log.count("ERROR: RM_GetLocalHBAInfoV3 failed for adapter " + std::to_string(skipped) +
+                      ". status = 6"),
+            1);
+  data.buildSANData();
+  expectTargets(data, rest);
 }
 
 TEST_F(FaultedSiteChild, DISABLED_NoNicFunction) {

@@ -134,8 +134,10 @@ TEST_F(SampleSite, LogsTheDiscoveryTraceUnderOneSourceName) {
   EXPECT_EQ(log.count("Data Pointer deleted."), 1);
   EXPECT_EQ(log.fileOf("Data Pointer Constructed."), "NRV_Data.cpp");
   EXPECT_EQ(log.fileOf("buildSANData"), "NRV_Data.cpp");
-  // A scanning pass ending at the first NIC function, then the building pass.
+  // A scanning pass ending at the first NIC function, then the building pass;
+  // the first list (one entry) is too small and is asked for again.
   EXPECT_EQ(log.count("Invoking RM_GetAllLocalHBAInstances."), 2);
+  EXPECT_EQ(log.count("Number of Adapters detected = " + std::to_string(functions.size())), 1);
   EXPECT_EQ(log.countPrefix("Got NIC adapter "), static_cast<int>(countOf("nic")));
   EXPECT_EQ(log.countPrefix("Got ISCSI adapter "), static_cast<int>(countOf("iscsi")));
   EXPECT_EQ(log.countPrefix("Got FCOE adapter "), static_cast<int>(countOf("fcoe")));
