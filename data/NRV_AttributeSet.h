@@ -29,7 +29,8 @@ class AttributeSet {
   // "" when the member is absent or unread.
   const std::string& text(uint16_t number) const;
   const std::string& text(std::string_view label) const;
-  // Whether the kind carries the member at all (read or not).
+  // Whether the set carries the member (read or not); a set whose blob could
+  // not be obtained carries none of the blob's members.
   bool has(std::string_view label) const;
 
   struct Member {

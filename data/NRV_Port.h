@@ -37,7 +37,8 @@ class Port {
   virtual const PortAttributes* getAttributes() const;
   // FC, iSCSI and FCoE ports read fresh statistics on every call and keep
   // them; when the read fails the previous object (null the first time) is
-  // answered.  A NIC port answers its stored object, which stays null.
+  // answered.  A NIC port answers its stored object, which stays null.  The
+  // object answered is the port's and lives until the next call.
   virtual const PortStatistics* getStatistics();
   virtual Adapter* getAdapter() const;
   // FC and FCoE ports replace their targets by the HBA API's target mapping;
