@@ -22,13 +22,27 @@ namespace {
 
 const char* const kLevelNames[] = {"FATAL", "ERR", "WARN", "INFO", "DBG"};
 
+// Constant-initialised, so it is usable from any static initialiser or
+// destructor of the module, and closed when the module is unloaded.
 struct Trace_Target {
+  std::once_flag configured;
   bool enabled = false;
   int level = -1;
   int lock_fd = -1;
   FILE* out = nullptr;
   std::mutex mutex;
+
+  ~Trace_Target() {
+    std::lock_guard<std::mutex> guard(mutex);
+    enabled = false;
+    if (out) std::fclose(out);
+    if (lock_fd >= 0) close(lock_fd);
+    out = nullptr;
+    lock_fd = -1;
+  }
 };
+
+constinit Trace_Target g_target;
 
 std::string trim_right(std::string s) {
   while (!s.empty() && std::isspace(static_cast<unsigned char>(s.back()))) s.pop_back();
@@ -71,15 +85,9 @@ void configure(Trace_Target& target) {
   target.enabled = target.out != nullptr;
 }
 
-// Lives for the whole process: messages may be written from static
-// destructors of other units.
 Trace_Target& target() {
-  static Trace_Target* const instance = [] {
-    auto* t = new Trace_Target;
-    configure(*t);
-    return t;
-  }();
-  return *instance;
+  std::call_once(g_target.configured, [] { configure(g_target); });
+  return g_target;
 }
 
 int lock_file(int fd, short type) {
@@ -113,7 +121,7 @@ void trace_log(Log_Level level, const char* file, int line, const char* format, 
   if (dot != std::string::npos) stamp.resize(dot);
 
   std::lock_guard<std::mutex> guard(t.mutex);
-  if (lock_file(t.lock_fd, F_WRLCK) != 0) return;
+  if (!t.enabled || lock_file(t.lock_fd, F_WRLCK) != 0) return;
   std::fprintf(t.out, "%s %s: %s(%d): ", stamp.c_str(), log_level_name(level), file, line);
   size_t n = std::strlen(message);
   std::fputs(message, t.out);
