@@ -158,8 +158,8 @@ CMPI_Call::CMPI_Call(const char* function, const void* mi_handle, const CMPICont
   auto* record = static_cast<const CMPI_Static_Data*>(mi_handle);
   adapter_ = record ? record->adapter : nullptr;
   if (adapter_ == nullptr) return;
-  thread_context_ = std::make_unique<CMPI_Thread_Context>(adapter_->broker(), context, adapter_);
-  Thread_Context::push(thread_context_.get());
+  thread_context_.emplace(adapter_->broker(), context, adapter_);
+  Thread_Context::push(&*thread_context_);
   adapter_->mutex().lock();
   CIMPLE_DBG("enter: %s()", function_);
 }

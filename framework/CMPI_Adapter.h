@@ -12,6 +12,7 @@
 
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
 
 #include "cmpimacs.h"
@@ -94,8 +95,19 @@ class CMPI_Call {
   const char* function_;
   CMPI_Adapter* adapter_ = nullptr;
   const CMPIContext* cmpi_context_;
-  std::unique_ptr<CMPI_Thread_Context> thread_context_;
+  std::optional<CMPI_Thread_Context> thread_context_;
 };
+
+// Runs the work of one call.  Nothing may unwind into the CIMOM: an
+// exception (an allocation failure) answers CMPI_RC_ERR_FAILED instead.
+template <class Work>
+CMPIStatus run(CMPI_Call& call, Work&& work) noexcept {
+  try {
+    return work();
+  } catch (...) {
+    return call.finish(CMPI_RC_ERR_FAILED);
+  }
+}
 
 // The MI tables of each kind, in the CMPI standard's slot order.
 void fill_instance_table(CMPIInstanceMIFT& table, const char* name);

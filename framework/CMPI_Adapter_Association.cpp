@@ -46,15 +46,17 @@ CMPIStatus associator_names(CMPIAssociationMI* mi, const CMPIContext* ctx, const
                             const char* result_role) {
   CMPI_Call call("associatorNames", mi ? mi->hdl : nullptr, ctx);
   if (!call.adapter()) return kNoAdapter;
-  const std::string ns = name_space_of(path);
-  Instance_Ptr source;
-  if (CMPIrc rc = source_model(call, path, ns, source); rc != CMPI_RC_OK) return call.finish(rc);
-  if (!source || rslt == nullptr) return call.finish(CMPI_RC_OK);
-  CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), nullptr};
-  delivery.own_name_space = true;
-  int result = call.adapter()->handle().enum_associator_names(source.get(), given(result_class), given(role),
-                                                              given(result_role), deliver_object_path, &delivery);
-  return call.finish(map_associator_names(result));
+  return run(call, [&]() -> CMPIStatus {
+    const std::string ns = name_space_of(path);
+    Instance_Ptr source;
+    if (CMPIrc rc = source_model(call, path, ns, source); rc != CMPI_RC_OK) return call.finish(rc);
+    if (!source || rslt == nullptr) return call.finish(CMPI_RC_OK);
+    CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), nullptr};
+    delivery.own_name_space = true;
+    int result = call.adapter()->handle().enum_associator_names(source.get(), given(result_class), given(role),
+                                                                given(result_role), deliver_object_path, &delivery);
+    return call.finish(map_associator_names(result));
+  });
 }
 
 CMPIStatus associators(CMPIAssociationMI* mi, const CMPIContext* ctx, const CMPIResult* rslt,
@@ -62,30 +64,32 @@ CMPIStatus associators(CMPIAssociationMI* mi, const CMPIContext* ctx, const CMPI
                        const char* result_role, const char** properties) {
   CMPI_Call call("associators", mi ? mi->hdl : nullptr, ctx);
   if (!call.adapter()) return kNoAdapter;
-  const std::string ns = name_space_of(path);
-  Instance_Ptr source;
-  if (CMPIrc rc = source_model(call, path, ns, source); rc != CMPI_RC_OK) return call.finish(rc);
-  if (!source || rslt == nullptr) return call.finish(CMPI_RC_OK);
-  Provider_Handle& handle = call.adapter()->handle();
-  CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), properties};
-  delivery.own_name_space = true;
-  int result = handle.enum_associators(source.get(), given(result_class), given(role), given(result_role),
-                                       deliver_instance, &delivery);
-  if (result != ENUM_ASSOCIATORS_UNSUPPORTED)
+  return run(call, [&]() -> CMPIStatus {
+    const std::string ns = name_space_of(path);
+    Instance_Ptr source;
+    if (CMPIrc rc = source_model(call, path, ns, source); rc != CMPI_RC_OK) return call.finish(rc);
+    if (!source || rslt == nullptr) return call.finish(CMPI_RC_OK);
+    Provider_Handle& handle = call.adapter()->handle();
+    CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), properties};
+    delivery.own_name_space = true;
+    int result = handle.enum_associators(source.get(), given(result_class), given(role), given(result_role),
+                                         deliver_instance, &delivery);
+    if (result != ENUM_ASSOCIATORS_UNSUPPORTED)
+      return call.finish(map_result(result, {{0, CMPI_RC_OK},
+                                             {ENUM_ASSOCIATORS_FAILED, CMPI_RC_ERR_FAILED},
+                                             {ENUM_ASSOCIATORS_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
+                                    CMPI_RC_ERR_FAILED));
+    // The provider knows only the far ends' keys: fetch each whole object
+    // from the CIMOM, which routes to the far end's own provider.
+    CMPI_Delivery fetch{call.broker(), ctx, rslt, ns.c_str(), properties};
+    fetch.own_name_space = true;
+    result = handle.enum_associator_names(source.get(), given(result_class), given(role), given(result_role),
+                                          deliver_fetched_instance, &fetch);
     return call.finish(map_result(result, {{0, CMPI_RC_OK},
-                                           {ENUM_ASSOCIATORS_FAILED, CMPI_RC_ERR_FAILED},
-                                           {ENUM_ASSOCIATORS_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
-                                  CMPI_RC_ERR_FAILED));
-  // The provider knows only the far ends' keys: fetch each whole object
-  // from the CIMOM, which routes to the far end's own provider.
-  CMPI_Delivery fetch{call.broker(), ctx, rslt, ns.c_str(), properties};
-  fetch.own_name_space = true;
-  result = handle.enum_associator_names(source.get(), given(result_class), given(role), given(result_role),
-                                        deliver_fetched_instance, &fetch);
-  return call.finish(map_result(result, {{0, CMPI_RC_OK},
-                                         {ENUM_ASSOCIATOR_NAMES_FAILED, CMPI_RC_ERR_FAILED},
-                                         {ENUM_ASSOCIATOR_NAMES_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
-                                CMPI_RC_ERR_NOT_SUPPORTED));
+                                           {ENUM_ASSOCIATOR_NAMES_FAILED, CMPI_RC_ERR_FAILED},
+                                           {ENUM_ASSOCIATOR_NAMES_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
+                                  CMPI_RC_ERR_NOT_SUPPORTED));
+  });
 }
 
 // The association model: an empty instance of the provider's class, its
@@ -100,31 +104,35 @@ CMPIStatus reference_names(CMPIAssociationMI* mi, const CMPIContext* ctx, const 
                            const CMPIObjectPath* path, const char*, const char* role) {
   CMPI_Call call("referenceNames", mi ? mi->hdl : nullptr, ctx);
   if (!call.adapter()) return kNoAdapter;
-  const std::string ns = name_space_of(path);
-  Instance_Ptr source;
-  if (CMPIrc rc = source_model(call, path, ns, source); rc != CMPI_RC_OK) return call.finish(rc);
-  if (!source || rslt == nullptr || !call.adapter()->meta_class()) return call.finish(CMPI_RC_OK);
-  Instance_Ptr model = association_model(*call.adapter(), true);
-  CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), nullptr};
-  int result = call.adapter()->handle().enum_references(source.get(), model.get(), given(role), deliver_object_path,
-                                                        &delivery);
-  return call.finish(map_references(result));
+  return run(call, [&]() -> CMPIStatus {
+    const std::string ns = name_space_of(path);
+    Instance_Ptr source;
+    if (CMPIrc rc = source_model(call, path, ns, source); rc != CMPI_RC_OK) return call.finish(rc);
+    if (!source || rslt == nullptr || !call.adapter()->meta_class()) return call.finish(CMPI_RC_OK);
+    Instance_Ptr model = association_model(*call.adapter(), true);
+    CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), nullptr};
+    int result = call.adapter()->handle().enum_references(source.get(), model.get(), given(role), deliver_object_path,
+                                                          &delivery);
+    return call.finish(map_references(result));
+  });
 }
 
 CMPIStatus references(CMPIAssociationMI* mi, const CMPIContext* ctx, const CMPIResult* rslt,
                       const CMPIObjectPath* path, const char*, const char* role, const char** properties) {
   CMPI_Call call("references", mi ? mi->hdl : nullptr, ctx);
   if (!call.adapter()) return kNoAdapter;
-  const std::string ns = name_space_of(path);
-  Instance_Ptr source;
-  if (CMPIrc rc = source_model(call, path, ns, source); rc != CMPI_RC_OK) return call.finish(rc);
-  if (!source || rslt == nullptr || !call.adapter()->meta_class()) return call.finish(CMPI_RC_OK);
-  Instance_Ptr model = association_model(*call.adapter(), false);
-  CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), properties};
-  delivery.apply_list = true;
-  int result =
-      call.adapter()->handle().enum_references(source.get(), model.get(), given(role), deliver_instance, &delivery);
-  return call.finish(map_references(result));
+  return run(call, [&]() -> CMPIStatus {
+    const std::string ns = name_space_of(path);
+    Instance_Ptr source;
+    if (CMPIrc rc = source_model(call, path, ns, source); rc != CMPI_RC_OK) return call.finish(rc);
+    if (!source || rslt == nullptr || !call.adapter()->meta_class()) return call.finish(CMPI_RC_OK);
+    Instance_Ptr model = association_model(*call.adapter(), false);
+    CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), properties};
+    delivery.apply_list = true;
+    int result =
+        call.adapter()->handle().enum_references(source.get(), model.get(), given(role), deliver_instance, &delivery);
+    return call.finish(map_references(result));
+  });
 }
 
 }  // namespace

@@ -49,32 +49,40 @@ CMPIStatus activate_filter(CMPIIndicationMI* mi, const CMPIContext* ctx, const C
                            const CMPIObjectPath* path, CMPIBoolean) {
   CMPI_Call call("activateFilter", mi ? mi->hdl : nullptr, ctx);
   if (!call.adapter()) return kNoAdapter;
-  call.adapter()->activate_filter(name_space_of(path));
-  return call.finish(CMPI_RC_OK);
+  return run(call, [&]() -> CMPIStatus {
+    call.adapter()->activate_filter(name_space_of(path));
+    return call.finish(CMPI_RC_OK);
+  });
 }
 
 CMPIStatus deactivate_filter(CMPIIndicationMI* mi, const CMPIContext* ctx, const CMPISelectExp*, const char*,
                              const CMPIObjectPath* path, CMPIBoolean) {
   CMPI_Call call("deActivateFilter", mi ? mi->hdl : nullptr, ctx);
   if (!call.adapter()) return kNoAdapter;
-  call.adapter()->deactivate_filter(name_space_of(path));
-  return call.finish(CMPI_RC_OK);
+  return run(call, [&]() -> CMPIStatus {
+    call.adapter()->deactivate_filter(name_space_of(path));
+    return call.finish(CMPI_RC_OK);
+  });
 }
 
 CMPIStatus enable_indications(CMPIIndicationMI* mi, const CMPIContext* ctx) {
   CMPI_Call call("enableIndications", mi ? mi->hdl : nullptr, ctx);
   if (!call.adapter()) return kNoAdapter;
-  using Indication_Proc = bool (*)(Instance*, void*);
-  Indication_Proc proc = deliver_indication;
-  int result = call.adapter()->handle().enable_indications(reinterpret_cast<void*>(proc), call.adapter());
-  return call.finish(result == ENABLE_INDICATIONS_FAILED ? CMPI_RC_ERR_FAILED : CMPI_RC_OK);
+  return run(call, [&]() -> CMPIStatus {
+    using Indication_Proc = bool (*)(Instance*, void*);
+    Indication_Proc proc = deliver_indication;
+    int result = call.adapter()->handle().enable_indications(reinterpret_cast<void*>(proc), call.adapter());
+    return call.finish(result == ENABLE_INDICATIONS_FAILED ? CMPI_RC_ERR_FAILED : CMPI_RC_OK);
+  });
 }
 
 CMPIStatus disable_indications(CMPIIndicationMI* mi, const CMPIContext* ctx) {
   CMPI_Call call("disableIndications", mi ? mi->hdl : nullptr, ctx);
   if (!call.adapter()) return kNoAdapter;
-  int result = call.adapter()->handle().disable_indications();
-  return call.finish(result == DISABLE_INDICATIONS_FAILED ? CMPI_RC_ERR_FAILED : CMPI_RC_OK);
+  return run(call, [&]() -> CMPIStatus {
+    int result = call.adapter()->handle().disable_indications();
+    return call.finish(result == DISABLE_INDICATIONS_FAILED ? CMPI_RC_ERR_FAILED : CMPI_RC_OK);
+  });
 }
 
 }  // namespace
