@@ -6,7 +6,10 @@
 
 #include <algorithm>
 #include <cctype>
+#include <condition_variable>
+#include <memory>
 #include <set>
+#include <vector>
 
 #include "host/EncObjects.h"
 
@@ -14,8 +17,18 @@ namespace nrv::host {
 
 namespace {
 
-std::mutex gBrokersMu;
-std::set<const Broker*> gBrokers;
+// Never destroyed: module threads may still look brokers up while the process exits.
+struct BrokerList {
+  std::mutex mu;
+  std::condition_variable idle;
+  std::set<const Broker*> live;
+  std::vector<std::unique_ptr<CMPIBroker>> handles;  // every handle ever given out
+};
+
+BrokerList& brokers() {
+  static BrokerList* list = new BrokerList();
+  return *list;
+}
 
 std::string lower(std::string s) {
   std::transform(s.begin(), s.end(), s.begin(),
@@ -59,8 +72,8 @@ void setFailure(CMPIStatus* rc, const Broker& broker, const Outcome& outcome) {
 // caller's context entries.
 std::optional<Outcome> upcall(const CMPIBroker* mb, const CMPIContext* ctx,
                               const CMPIObjectPath* op, Request& request, CMPIStatus* rc) {
-  Broker* broker = Broker::from(mb);
-  if (broker == nullptr) {
+  BrokerRef broker = Broker::acquire(mb);
+  if (!broker) {
     setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
     return std::nullopt;
   }
@@ -102,30 +115,35 @@ CMPIEnumeration* enumerationUpcall(const CMPIBroker* mb, const CMPIContext* ctx,
 // ---- thread attachment --------------------------------------------------------------------
 CMPIContext* prepareAttachThread(const CMPIBroker* mb, const CMPIContext* ctx) {
   auto data = contextOf(ctx);
-  if (Broker::from(mb) == nullptr || !data) return nullptr;
+  if (!Broker::isLive(mb) || !data) return nullptr;
   // Outlives the request that prepares it; detachThread releases it.
   return makeContext(mb, std::move(*data), true, true);
 }
 
 CMPIStatus attachThread(const CMPIBroker* mb, const CMPIContext* ctx) {
-  if (Broker::from(mb) == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
+  BrokerRef broker = Broker::acquire(mb);
+  if (!broker) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
   if (!contextOf(ctx)) return makeStatus(CMPI_RC_ERR_INVALID_PARAMETER);
+  broker->noteAttach(1);
   attachThreadArena();
   return makeStatus(CMPI_RC_OK);
 }
 
 CMPIStatus detachThread(const CMPIBroker* mb, const CMPIContext* ctx) {
-  if (Broker::from(mb) == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
+  BrokerRef broker = Broker::acquire(mb);
+  if (!broker) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
   auto* context = ObjectRegistry::instance().find<EncContext>(ctx);
   if (context == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_PARAMETER);
   if (context->prepared) ObjectRegistry::instance().release(ctx);
-  return makeStatus(detachThreadArena() ? CMPI_RC_OK : CMPI_RC_ERR_FAILED);
+  if (!detachThreadArena()) return makeStatus(CMPI_RC_ERR_FAILED);
+  broker->noteAttach(-1);
+  return makeStatus(CMPI_RC_OK);
 }
 
 // The host has no indication consumers; an indication is accepted and dropped.
 CMPIStatus deliverIndication(const CMPIBroker* mb, const CMPIContext*, const char* ns,
                              const CMPIInstance* ind) {
-  if (Broker::from(mb) == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
+  if (!Broker::isLive(mb)) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
   if (ns == nullptr || !instanceOf(ind)) return makeStatus(CMPI_RC_ERR_INVALID_PARAMETER);
   return makeStatus(CMPI_RC_OK);
 }
@@ -264,7 +282,7 @@ CMPIData invokeMethod(const CMPIBroker* mb, const CMPIContext* ctx, const CMPIOb
   auto* outArgs = ObjectRegistry::instance().find<EncArgs>(out);
   auto inArgs = in == nullptr ? std::optional<NamedData>(NamedData{}) : argsOf(in);
   if (method == nullptr || !inArgs || (out != nullptr && outArgs == nullptr)) {
-    setStatus(rc, Broker::from(mb) == nullptr ? CMPI_RC_ERR_INVALID_HANDLE
+    setStatus(rc, !Broker::isLive(mb) ? CMPI_RC_ERR_INVALID_HANDLE
                                               : CMPI_RC_ERR_INVALID_PARAMETER);
     return badData();
   }
@@ -350,31 +368,59 @@ const CMPIBrokerFT kBrokerFT = {
 };
 
 Broker::Broker(Router& router) : router_(router) {
-  broker_.hdl = this;
-  broker_.bft = &kBrokerFT;
-  broker_.eft = &kBrokerEncFT;
-  broker_.xft = &kBrokerExtFT;
-  broker_.mft = &kBrokerMemFT;
-  for (const auto& p : kDefaultParents) addClassParent(p[0], p[1]);
-  std::lock_guard<std::mutex> lock(gBrokersMu);
-  gBrokers.insert(this);
+  BrokerList& list = brokers();
+  std::lock_guard<std::mutex> lock(list.mu);
+  list.handles.push_back(std::make_unique<CMPIBroker>());
+  broker_ = list.handles.back().get();
+  broker_->hdl = this;
+  broker_->bft = &kBrokerFT;
+  broker_->eft = &kBrokerEncFT;
+  broker_->xft = &kBrokerExtFT;
+  broker_->mft = &kBrokerMemFT;
+  for (const auto& p : kDefaultParents) parents_[lower(p[0])] = p[1];
+  list.live.insert(this);
 }
 
 Broker::~Broker() {
   {
-    std::lock_guard<std::mutex> lock(gBrokersMu);
-    gBrokers.erase(this);
+    BrokerList& list = brokers();
+    std::unique_lock<std::mutex> lock(list.mu);
+    list.live.erase(this);
+    list.idle.wait(lock, [this] { return active_ == 0; });
+    broker_->hdl = nullptr;
   }
-  ObjectRegistry::instance().freeOwner(&broker_);
+  ObjectRegistry::instance().freeOwner(broker_);
 }
 
-Broker* Broker::from(const CMPIBroker* mb) {
-  if (mb == nullptr) return nullptr;
-  std::lock_guard<std::mutex> lock(gBrokersMu);
-  for (const Broker* b : gBrokers) {
-    if (b->cmpi() == mb) return const_cast<Broker*>(b);
+bool Broker::isLive(const CMPIBroker* mb) {
+  if (mb == nullptr) return false;
+  BrokerList& list = brokers();
+  std::lock_guard<std::mutex> lock(list.mu);
+  for (const Broker* b : list.live) {
+    if (b->broker_ == mb) return true;
   }
-  return nullptr;
+  return false;
+}
+
+BrokerRef Broker::acquire(const CMPIBroker* mb) {
+  if (mb == nullptr) return BrokerRef();
+  BrokerList& list = brokers();
+  std::lock_guard<std::mutex> lock(list.mu);
+  for (const Broker* b : list.live) {
+    if (b->broker_ == mb) {
+      Broker* live = const_cast<Broker*>(b);
+      ++live->active_;
+      return BrokerRef(live);
+    }
+  }
+  return BrokerRef();
+}
+
+BrokerRef::~BrokerRef() {
+  if (broker_ == nullptr) return;
+  BrokerList& list = brokers();
+  std::lock_guard<std::mutex> lock(list.mu);
+  if (--broker_->active_ == 0) list.idle.notify_all();
 }
 
 void Broker::addClassParent(const std::string& child, const std::string& parent) {

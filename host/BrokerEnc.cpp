@@ -16,7 +16,7 @@ ObjectRegistry& registry() { return ObjectRegistry::instance(); }
 
 // Every factory first checks the broker handle.
 bool validBroker(const CMPIBroker* mb, CMPIStatus* rc) {
-  if (Broker::from(mb) != nullptr) return true;
+  if (Broker::isLive(mb)) return true;
   setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
   return false;
 }
@@ -110,10 +110,10 @@ CMPISelectExp* newSelectExp(const CMPIBroker* mb, const char*, const char*, CMPI
 
 CMPIBoolean classPathIsA(const CMPIBroker* mb, const CMPIObjectPath* op, const char* type,
                          CMPIStatus* rc) {
-  Broker* broker = Broker::from(mb);
+  BrokerRef broker = Broker::acquire(mb);
   auto path = pathOf(op);
-  if (broker == nullptr || !path || type == nullptr) {
-    setStatus(rc, broker == nullptr ? CMPI_RC_ERR_INVALID_HANDLE : CMPI_RC_ERR_INVALID_PARAMETER);
+  if (!broker || !path || type == nullptr) {
+    setStatus(rc, !broker ? CMPI_RC_ERR_INVALID_HANDLE : CMPI_RC_ERR_INVALID_PARAMETER);
     return 0;
   }
   setStatus(rc, CMPI_RC_OK);
@@ -252,7 +252,7 @@ CMPIString* getMessage2(const CMPIBroker* mb, const char*, const CMPIMsgFileHand
 // Provider log and trace lines go to stderr only when NRV_HOST_LOG is set.
 CMPIStatus emit(const CMPIBroker* mb, const char* kind, const char* id, const char* text,
                 const CMPIString* string) {
-  if (Broker::from(mb) == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
+  if (!Broker::isLive(mb)) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
   if (std::getenv("NRV_HOST_LOG") != nullptr) {
     const std::string extra = string == nullptr ? "" : stringOf(string).value_or("");
     std::fprintf(stderr, "[%s] %s: %s%s\n", kind, id == nullptr ? "" : id,
@@ -280,14 +280,14 @@ CMPIError* newCMPIError(const CMPIBroker* mb, const char*, const char*, const ch
 
 // No message files: the handle stays null and getMessage2 answers the default text.
 CMPIStatus openMessageFile(const CMPIBroker* mb, const char*, CMPIMsgFileHandle* handle) {
-  if (Broker::from(mb) == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
+  if (!Broker::isLive(mb)) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
   if (handle == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_PARAMETER);
   *handle = nullptr;
   return makeStatus(CMPI_RC_OK);
 }
 
 CMPIStatus closeMessageFile(const CMPIBroker* mb, const CMPIMsgFileHandle) {
-  return makeStatus(Broker::from(mb) == nullptr ? CMPI_RC_ERR_INVALID_HANDLE : CMPI_RC_OK);
+  return makeStatus(!Broker::isLive(mb) ? CMPI_RC_ERR_INVALID_HANDLE : CMPI_RC_OK);
 }
 
 // ---- memory services ------------------------------------------------------------------------
@@ -299,7 +299,7 @@ CMPIGcStat* mark(const CMPIBroker* mb, CMPIStatus* rc) {
 }
 
 CMPIStatus release(const CMPIBroker* mb, const CMPIGcStat* gc) {
-  if (Broker::from(mb) == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
+  if (!Broker::isLive(mb)) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
   if (gc == nullptr || gc != ObjectRegistry::currentArena()) {
     return makeStatus(CMPI_RC_ERR_INVALID_PARAMETER);
   }
@@ -309,7 +309,7 @@ CMPIStatus release(const CMPIBroker* mb, const CMPIGcStat* gc) {
 
 template <typename T, typename H>
 void freeObject(const CMPIBroker* mb, H* handle) {
-  if (Broker::from(mb) != nullptr && registry().find<T>(handle) != nullptr) {
+  if (Broker::isLive(mb) && registry().find<T>(handle) != nullptr) {
     registry().release(handle);
   }
 }

@@ -6,6 +6,7 @@
 #include <cstdlib>
 #include <functional>
 #include <map>
+#include <memory>
 #include <optional>
 
 #include "host/Host.h"
@@ -74,9 +75,6 @@ std::variant<Command, UsageError> parseCommand(const std::vector<std::string>& a
       auto v = value();
       if (!v) return UsageError{a + " needs a property list"};
       c.properties = splitCommas(*v);
-    } else if (!a.empty() && a[0] == '-' && a.size() > 1 && !positional.empty() &&
-               positional.size() >= 2 && a.find('=') != std::string::npos) {
-      positional.push_back(a);  // a negative value in an assignment, not an option
     } else if (!a.empty() && a[0] == '-' && a.size() > 1) {
       bool known = false;
       for (const auto& spec : kFilterOptions) {
@@ -323,9 +321,12 @@ int runCimClient(const std::vector<std::string>& args, std::ostream& out, std::o
   if (op == operations().end()) return usage("unknown operation " + c.op, err);
   auto path = parsePath(c.pathText);
   if (auto* e = std::get_if<TextError>(&path)) return usage(e->message, err);
-  Host host(modulePath(c));
-  const int status = op->second(host, c, std::get<PathData>(path), out, err);
-  host.shutdown();
+  auto host = std::make_unique<Host>(modulePath(c));
+  const int status = op->second(*host, c, std::get<PathData>(path), out, err);
+  // What was printed stays printed whatever the module does while it unloads.
+  out.flush();
+  err.flush();
+  host.reset();
   return status;
 }
 

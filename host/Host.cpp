@@ -68,6 +68,9 @@ Host::Host(const std::string& modulePath, Options options)
 
 Host::~Host() {
   shutdown();
+  // A thread the module attached and never detached still runs module code: unmapping the
+  // module under it would crash the process, so it stays mapped.
+  if (module_ && broker_->attachedThreads() > 0) module_->pin();
   // The module goes before the broker: its static destructors may still release objects.
   table_.reset();
   module_.reset();

@@ -17,8 +17,11 @@
 // - Operations may be called from several threads at once. Calls for one provider are
 //   serialised by the provider itself, not by the host.
 // - shutdown() (also run by the destructor) waits for running operations, refuses later ones
-//   with CMPI_RC_ERR_FAILED "host is shut down", calls every MI's cleanup with
-//   terminating=true (newest first), frees the broker's objects and unloads the module.
+//   with CMPI_RC_ERR_FAILED "host is shut down" and calls every MI's cleanup with
+//   terminating=true (newest first). The destructor then dlcloses the module (which stays
+//   mapped unless NRV_HOST_UNLOAD_MODULE is set, and always while a thread it attached has not
+//   detached) and frees the broker's objects; later broker calls from module threads are
+//   refused, not crashed on. A module loaded again by a later Host keeps its global state.
 // - A module that cannot be loaded is not fatal: loadError() says why, module classes answer
 //   CMPI_RC_ERR_FAILED, the platform classes still work.
 // - Platform instances come from the JSON file named by NRV_HOST_PLATFORM (see

@@ -6,6 +6,7 @@
 #include <strings.h>
 
 #include <algorithm>
+#include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <iterator>
@@ -82,7 +83,11 @@ std::vector<std::string> exportedFunctions(const std::string& path) {
 std::variant<std::unique_ptr<ModuleLoader>, std::string> ModuleLoader::open(
     const std::string& path) {
   dlerror();
-  void* handle = dlopen(path.c_str(), RTLD_NOW | RTLD_LOCAL);
+  // The module stays mapped after dlclose unless NRV_HOST_UNLOAD_MODULE is set: a module thread
+  // that outlives its cleanup keeps running valid code, memory the module's globals still hold
+  // is not reported as leaked, and leak reports at exit can name the module's functions.
+  const int keep = std::getenv("NRV_HOST_UNLOAD_MODULE") != nullptr ? 0 : RTLD_NODELETE;
+  void* handle = dlopen(path.c_str(), RTLD_NOW | RTLD_LOCAL | keep);
   if (handle == nullptr) {
     const char* err = dlerror();
     return std::string(err == nullptr ? "cannot open " + path : err);
@@ -109,6 +114,11 @@ ModuleLoader::ModuleLoader(std::string path, void* handle, std::vector<std::stri
 ModuleLoader::~ModuleLoader() { dlclose(handle_); }
 
 void* ModuleLoader::symbol(const std::string& name) const { return dlsym(handle_, name.c_str()); }
+
+void ModuleLoader::pin() const {
+  void* extra = dlopen(path_.c_str(), RTLD_NOW | RTLD_NOLOAD | RTLD_NODELETE);
+  if (extra != nullptr) dlclose(extra);
+}
 
 std::optional<std::string> ModuleLoader::factoryFor(const std::string& className,
                                                     MiKind kind) const {

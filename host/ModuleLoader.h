@@ -3,7 +3,9 @@
 // symbol table.
 //
 // Contract: the module stays loaded for the loader's lifetime; whoever called factories must
-// have cleaned up their MIs before the loader is destroyed (dlclose).
+// have cleaned up their MIs before the loader is destroyed (dlclose). The module stays mapped
+// after dlclose (RTLD_NODELETE), as long-running CIMOMs keep providers; NRV_HOST_UNLOAD_MODULE
+// set in the environment makes dlclose really unmap it.
 #ifndef NRV_HOST_MODULELOADER_H
 #define NRV_HOST_MODULELOADER_H
 
@@ -44,6 +46,9 @@ class ModuleLoader {
   // Every exported "..._Create_<Kind>MI" function of the module.
   const std::vector<std::string>& factorySymbols() const { return factories_; }
   void* symbol(const std::string& name) const;
+  // Keeps the module mapped after the loader's dlclose: for threads of the module that are
+  // still running when the host lets go of it.
+  void pin() const;
 
   // The factory that serves `className`: "<Class>_Provider_Create_<Kind>MI", else the alias
   // "<Class>_Create_<Kind>MI"; class names match case-insensitively. nullopt when neither
