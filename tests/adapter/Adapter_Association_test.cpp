@@ -97,10 +97,13 @@ TEST_F(Associations, AssociatorNamesAnswerTheFarEnds) {
 
 TEST_F(Associations, AssociatorsFallBackOnTheCimomForWholeFarEnds) {
   fake::Result result;
+  const char* list[] = {"Name", nullptr};
   ASSERT_EQ(mi_->ft->associators(mi_, context_, result.get(), card_path("A1"), nullptr, nullptr, nullptr, nullptr,
-                                 nullptr)
+                                 list)
                 .rc,
             CMPI_RC_OK);
+  ASSERT_EQ(broker_.property_lists.size(), 2u);
+  EXPECT_EQ(broker_.property_lists[0], list);
   const fake::Returned& r = result.returned();
   ASSERT_EQ(r.instances.size(), 2u);
   EXPECT_EQ(fake::text_of(fake::property_of(r.instances[1], "Name")), "Chip C2");  // not only the keys

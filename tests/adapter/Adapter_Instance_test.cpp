@@ -155,6 +155,20 @@ TEST_F(Instance_Ops, UnsupportedOperationsMapToNotSupported) {
             CMPI_RC_ERR_NOT_SUPPORTED);
 }
 
+TEST_F(Instance_Ops, EnumerationFailuresMapToTheirCodesWithoutDone) {
+  store().card_enumeration_result = ENUM_INSTANCES_ACCESS_DENIED;
+  fake::Result denied;
+  EXPECT_EQ(mi_->ft->enumerateInstanceNames(mi_, context_, denied.get(), path("NRVTAVO_Card")).rc,
+            CMPI_RC_ERR_ACCESS_DENIED);
+  EXPECT_EQ(denied.returned().done, 0);
+  store().card_enumeration_result = ENUM_INSTANCES_FAILED;
+  fake::Result failed;
+  EXPECT_EQ(mi_->ft->enumerateInstances(mi_, context_, failed.get(), path("NRVTAVO_Card"), nullptr).rc,
+            CMPI_RC_ERR_FAILED);
+  EXPECT_EQ(failed.returned().done, 0);
+  EXPECT_NE(traces().find("return: enumInstances(): CMPI_RC_ERR_FAILED"), std::string::npos);
+}
+
 TEST_F(Instance_Ops, ExecQueryIsNotSupported) {
   fake::Result result;
   EXPECT_EQ(mi_->ft->execQuery(mi_, context_, result.get(), path("NRVTAVO_Card"), "select * from x", "WQL").rc,

@@ -15,7 +15,10 @@ class Card_Provider : public Provider_Base {
   int load() { return ++store().loads, LOAD_OK; }
   int unload() { return ++store().unloads, UNLOAD_OK; }
   int get_instance(const Instance* model, Instance*& instance) { return store().cards.get_instance(model, instance); }
-  int enum_instances(const Instance*, const Handler& handler) { return store().cards.enum_instances(handler); }
+  int enum_instances(const Instance*, const Handler& handler) {
+    if (store().card_enumeration_result != 0) return store().card_enumeration_result;
+    return store().cards.enum_instances(handler);
+  }
   int create_instance(Instance* instance) { return store().cards.create_instance(instance); }
   int delete_instance(const Instance* instance) { return store().cards.delete_instance(instance); }
   int modify_instance(const Instance* model, const Instance* instance) {

@@ -28,7 +28,8 @@ struct Store {
   Instance_Map services{&NRVTAVO_ChannelMgmtService::static_meta_class};
   int loads = 0;
   int unloads = 0;
-  bool associators_supported = false;  // the link provider answers enum_associators itself
+  bool associators_supported = false;
+  int card_enumeration_result = 0;   // what the card provider's enumeration answers  // the link provider answers enum_associators itself
   // What the last method call saw.
   bool requested_state_null = true;
   uint16_t requested_state = 0;
