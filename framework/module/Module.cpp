@@ -71,9 +71,3 @@ extern "C" const cimple::Provider_Registration* cimple_module() { return cimple:
 NRV_FOR_EACH_PLAIN_PROVIDER_CLASS(NRV_PLAIN_PROVIDER)
 NRV_FOR_EACH_ASSOCIATION_PROVIDER_CLASS(NRV_ASSOCIATION_PROVIDER)
 
-// Placeholder until the CMPI adapter is linked in: hands out no MI object.
-extern "C" __attribute__((weak)) int cimple_cmpi_adapter(int, cimple::CMPI_Static_Data*,
-                                                         const cimple::Provider_Registration*, const CMPIBroker*,
-                                                         const CMPIContext*, const char*, char, void**) {
-  return 0;
-}
