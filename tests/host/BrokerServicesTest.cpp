@@ -128,6 +128,29 @@ TEST_F(BrokerServicesTest, ForeignBrokerHandleIsRefused) {
   EXPECT_EQ(router.calls, 0);
 }
 
+TEST(BrokerLifetimeTest, CallsAfterTheBrokerIsGoneAreRefused) {
+  test::ScriptedRouter router;
+  auto broker = std::make_unique<Broker>(router);
+  const CMPIBroker* mb = broker->cmpi();
+  CMPIContext* prepared = nullptr;
+  {
+    ArenaScope scope;
+    CMPIContext* ctx = makeContext(mb, Broker::requestContext("root/test"));
+    prepared = CBPrepareAttachThread(mb, ctx);
+  }
+  EXPECT_EQ(CBAttachThread(mb, prepared).rc, CMPI_RC_OK);
+  EXPECT_EQ(broker->attachedThreads(), 1);
+  broker.reset();  // e.g. a module thread that outlived its cleanup
+  CMPIStatus rc{CMPI_RC_OK, nullptr};
+  EXPECT_EQ(mb->eft->newString(mb, "late", &rc), nullptr);
+  EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_HANDLE);
+  EXPECT_EQ(CBDetachThread(mb, prepared).rc, CMPI_RC_ERR_INVALID_HANDLE);
+  EXPECT_EQ(mb->bft->enumerateInstanceNames(mb, prepared, nullptr, &rc), nullptr);
+  EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_HANDLE);
+  EXPECT_EQ(router.calls, 0);
+  detachThreadArena();  // the thread's own arena, left by the refused detach
+}
+
 TEST_F(BrokerServicesTest, AttachedThreadOwnsItsObjectsUntilDetach) {
   CMPIContext* prepared = CBPrepareAttachThread(mb, ctx);
   ASSERT_NE(prepared, nullptr);
