@@ -5,107 +5,15 @@
 #include <fstream>
 #include <set>
 #include <sstream>
-#include <stdexcept>
 
 #include <nlohmann/json.hpp>
+
+#include "sim/SiteJson.h"
 
 namespace nrvsim {
 namespace {
 
 using nlohmann::json;
-
-struct SiteError : std::runtime_error {
-  using std::runtime_error::runtime_error;
-};
-
-// A JSON node and the path that reached it, for messages.
-struct Node {
-  const json& j;
-  std::string path;
-
-  [[noreturn]] void fail(const std::string& why) const { throw SiteError(path + ": " + why); }
-
-  bool has(const char* key) const { return j.is_object() && j.contains(key) && !j.at(key).is_null(); }
-  Node at(const char* key) const {
-    if (!has(key)) Node{j, path + "." + key}.fail("missing");
-    return Node{j.at(key), path + "." + key};
-  }
-  Node at(size_t i) const { return Node{j.at(i), path + "[" + std::to_string(i) + "]"}; }
-
-  std::vector<Node> items(const char* key) const {
-    std::vector<Node> out;
-    if (!has(key)) return out;
-    Node list = at(key);
-    if (!list.j.is_array()) list.fail("must be an array");
-    for (size_t i = 0; i < list.j.size(); ++i) out.push_back(list.at(i));
-    return out;
-  }
-
-  uint64_t number() const {
-    if (j.is_number_unsigned()) return j.get<uint64_t>();
-    if (j.is_number_integer()) {
-      const int64_t v = j.get<int64_t>();
-      if (v < 0) fail("must not be negative");
-      return static_cast<uint64_t>(v);
-    }
-    if (j.is_string()) {  // "0x010a01" or "42"
-      const std::string s = j.get<std::string>();
-      try {
-        size_t used = 0;
-        const uint64_t v = std::stoull(s, &used, 0);
-        if (used == s.size() && !s.empty()) return v;
-      } catch (const std::exception&) {
-      }
-    }
-    fail("must be a number");
-  }
-  std::string text() const {
-    if (!j.is_string()) fail("must be a string");
-    return j.get<std::string>();
-  }
-  bool flag() const {
-    if (!j.is_boolean()) fail("must be true or false");
-    return j.get<bool>();
-  }
-  double real() const {
-    if (!j.is_number()) fail("must be a number");
-    return j.get<double>();
-  }
-
-  uint64_t u64(const char* key, uint64_t def) const { return has(key) ? at(key).number() : def; }
-  uint32_t u32(const char* key, uint32_t def) const {
-    const uint64_t v = u64(key, def);
-    if (v > UINT32_MAX) at(key).fail("out of range");
-    return static_cast<uint32_t>(v);
-  }
-  uint16_t u16(const char* key, uint16_t def) const {
-    const uint64_t v = u64(key, def);
-    if (v > UINT16_MAX) at(key).fail("out of range");
-    return static_cast<uint16_t>(v);
-  }
-  int32_t i32(const char* key, int32_t def) const {
-    if (!has(key)) return def;
-    Node n = at(key);
-    if (!n.j.is_number_integer()) n.fail("must be an integer");
-    return n.j.get<int32_t>();
-  }
-  std::string str(const char* key, const std::string& def = "") const {
-    return has(key) ? at(key).text() : def;
-  }
-  bool boolean(const char* key, bool def) const { return has(key) ? at(key).flag() : def; }
-  Wwn wwn(const char* key) const {
-    Node n = at(key);
-    auto w = parse_wwn(n.text());
-    if (!w) n.fail("not a world-wide name (16 hex digits, pairs may be split by ':')");
-    return *w;
-  }
-  Mac mac(const char* key) const {
-    Node n = at(key);
-    auto m = parse_mac(n.text());
-    if (!m) n.fail("not a MAC address (12 hex digits, pairs may be split by ':' or '-')");
-    return *m;
-  }
-};
 
 Endpoint read_endpoint(const Node& n) {  // "10.0.0.1:3260" or "[fe80::1]:3260"
   const std::string s = n.text();
