@@ -2,18 +2,25 @@
 
 #include <stdlib.h>
 
+#include <cstdlib>
+#include <filesystem>
 #include <fstream>
 #include <sstream>
 
 namespace test {
 
+namespace {
+// Outlives every static destructor, so the exit hook may still read it.
+char g_home[] = "/tmp/nrv_adapter_trace_XXXXXX";
+}  // namespace
+
 const std::string& trace_home() {
   static const std::string home = [] {
-    char dir[] = "/tmp/nrv_adapter_trace_XXXXXX";
-    std::string made = mkdtemp(dir) ? dir : "/tmp";
-    std::ofstream(made + "/.cimplerc") << "# adapter tests\n\nLOG_LEVEL = DBG  \n";
-    setenv("CIMPLE_HOME", made.c_str(), 1);
-    return made;
+    if (mkdtemp(g_home) == nullptr) return std::string("/tmp");
+    std::ofstream(std::string(g_home) + "/.cimplerc") << "# adapter tests\n\nLOG_LEVEL = DBG  \n";
+    setenv("CIMPLE_HOME", g_home, 1);
+    std::atexit([] { std::filesystem::remove_all(g_home); });
+    return std::string(g_home);
   }();
   return home;
 }

@@ -5,6 +5,7 @@
 #include <stdlib.h>
 #include <sys/stat.h>
 
+#include <filesystem>
 #include <fstream>
 #include <sstream>
 #include <string>
@@ -30,6 +31,12 @@ bool exists(const std::string& path) {
   return stat(path.c_str(), &st) == 0;
 }
 
+// Ends a child: its scratch directory goes, its verdict is the exit code.
+[[noreturn]] void finish(const std::string& dir, bool ok) {
+  std::filesystem::remove_all(dir);
+  std::exit(ok ? 0 : 1);
+}
+
 class Trace_File : public ::testing::Test {
  protected:
   static void SetUpTestSuite() { GTEST_FLAG_SET(death_test_style, "threadsafe"); }
@@ -42,9 +49,10 @@ TEST_F(Trace_File, WithoutCimpleHomeNothingIsWritten) {
       {
         unsetenv("CIMPLE_HOME");
         CIMPLE_ERR("never %d", 1);
-        std::exit(exists(dir + "/.cimple") ? 1 : 0);
+        finish(dir, !exists(dir + "/.cimple"));
       },
       ::testing::ExitedWithCode(0), "");
+  std::filesystem::remove_all(dir);
 }
 
 TEST_F(Trace_File, MessagesAtOrBelowTheLevelAreWrittenWithTheirOrigin) {
@@ -62,9 +70,10 @@ TEST_F(Trace_File, MessagesAtOrBelowTheLevelAreWrittenWithTheirOrigin) {
                   text.find(" ERR: ") != std::string::npos && text.find("kept error\n\n") == std::string::npos &&
                   text.find("dropped") == std::string::npos && exists(dir + "/.cimple/messages.lock") &&
                   text.size() > 20 && text[4] == '/' && text.find('.') > text.find(" WARN");
-        std::exit(ok ? 0 : 1);
+        finish(dir, ok);
       },
       ::testing::ExitedWithCode(0), "");
+  std::filesystem::remove_all(dir);
 }
 
 TEST_F(Trace_File, AnUnknownLevelWritesNothing) {
@@ -74,9 +83,10 @@ TEST_F(Trace_File, AnUnknownLevelWritesNothing) {
       {
         setenv("CIMPLE_HOME", dir.c_str(), 1);
         CIMPLE_ERR("nothing");
-        std::exit(exists(dir + "/.cimple/messages") ? 1 : 0);
+        finish(dir, !exists(dir + "/.cimple/messages"));
       },
       ::testing::ExitedWithCode(0), "");
+  std::filesystem::remove_all(dir);
 }
 
 TEST_F(Trace_File, AMissingConfigurationWritesNothing) {
@@ -85,9 +95,10 @@ TEST_F(Trace_File, AMissingConfigurationWritesNothing) {
       {
         setenv("CIMPLE_HOME", dir.c_str(), 1);
         CIMPLE_ERR("nothing");
-        std::exit(exists(dir + "/.cimple/messages") ? 1 : 0);
+        finish(dir, !exists(dir + "/.cimple/messages"));
       },
       ::testing::ExitedWithCode(0), "");
+  std::filesystem::remove_all(dir);
 }
 
 TEST(Trace_Levels, NamesFollowTheLevels) {
