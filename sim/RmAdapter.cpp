@@ -158,4 +158,28 @@ RM_STATUS handle_SetDumpRetentionCount(HBA_NAME a1, HBA_UINT32 count) {
   });
 }
 
+
+// Registrations are kept so that they can be removed; the site never changes
+// on its own, so no event is ever delivered.
+RM_STATUS handle_RegisterForAdapterPortEvents(HBA_NAME a1, RM_EVENT_CALLBACK callback, void*, void** registration) {
+  if (callback == nullptr || registration == nullptr) return kStatusBadArgument;
+  return on_function(a1, [&](Site& s, FunctionRef) -> RM_STATUS {
+    const uint32_t id = s.next_registration++;
+    s.registrations.insert(id);
+    *registration = reinterpret_cast<void*>(static_cast<uintptr_t>(id));  // opaque to the caller
+    return RM_STATUS_SUCCESS;
+  });
+}
+
+RM_STATUS handle_UnRegisterForAdapterPortEvents(HBA_NAME a1, void* registration) {
+  const auto id = static_cast<uint32_t>(reinterpret_cast<uintptr_t>(registration));
+  return on_function(a1, [&](Site& s, FunctionRef) -> RM_STATUS {
+    return s.registrations.erase(id) ? RM_STATUS(RM_STATUS_SUCCESS) : RM_STATUS(kStatusNotFound);
+  });
+}
+
+RM_STATUS handle_SetDebugTraces(HBA_UINT32, HBA_UINT32 level) {
+  return level > 11 ? RM_STATUS(kStatusBadValue) : RM_STATUS(RM_STATUS_SUCCESS);
+}
+
 }  // namespace nrvsim::rm

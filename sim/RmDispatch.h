@@ -49,7 +49,9 @@ NRV_RM_PAIRED_FUNCTIONS(NRVSIM_SIG_)
   X(CNA_GetPGPriorityBitmaps) X(CNA_SetPGPriorityBitmaps) X(CNA_SetPGPriorityBitmapsExt)     \
   X(CNA_SetPGBandwidth) X(CNA_SetPFC) X(CNA_SetDcbxPortVars) X(CNA_SetLldp)                  \
   X(CNA_SetPGSetting) X(CNA_SetTLV) X(CNA_GetTLV) X(GetQoS) X(SetQoS) X(SetAdapterAttribute) \
-  X(SetBootBiosState) X(SetNetbootParams) X(SetPhyPortSpeedSettings) X(GetServerAttributes)
+  X(SetBootBiosState) X(SetNetbootParams) X(SetPhyPortSpeedSettings) X(GetServerAttributes) \
+  X(RegisterForAdapterPortEvents) X(UnRegisterForAdapterPortEvents) X(SetDebugTraces)        \
+  X(VPDelete)
 
 template <class Tag>
 struct Dispatch {

@@ -267,4 +267,14 @@ RM_STATUS handle_SetOASLunState(HBA_NAME a1, HBA_NAME /*initiator*/, HBA_NAME ta
   });
 }
 
+
+RM_STATUS handle_VPDelete(HBA_NAME a1, HBA_NAME vport) {
+  return on_fcoe(a1, [&](Site&, Function& fn) -> RM_STATUS {
+    auto it = std::find_if(fn.vports.begin(), fn.vports.end(), [&](const VPort& v) { return v.wwpn == to_wwn(vport); });
+    if (it == fn.vports.end()) return kStatusNotFound;
+    fn.vports.erase(it);
+    return RM_STATUS_SUCCESS;
+  });
+}
+
 }  // namespace nrvsim::rm

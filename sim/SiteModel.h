@@ -6,6 +6,7 @@
 #include <array>
 #include <cstdint>
 #include <map>
+#include <set>
 #include <string>
 #include <utility>
 #include <variant>
@@ -254,6 +255,8 @@ struct Site {
   std::map<uint32_t, DiagRun> diagnostics;  // by handle
   uint32_t next_diag_handle = 1;
   std::vector<std::string> dump_files;
+  std::set<uint32_t> registrations;  // event registrations of the management library
+  uint32_t next_registration = 1;
 };
 
 }  // namespace nrvsim

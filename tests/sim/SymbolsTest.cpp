@@ -47,6 +47,14 @@ TEST(Symbols, FallbackLibraryHasEveryName) {
   expect_management(lib, true);
 }
 
+TEST(Symbols, FallbackLibraryAnswersFromTheSameSite) {
+  Library lib(library_path("sim-fallback", "librmapi.so"));
+  ASSERT_TRUE(lib.ok());
+  EXPECT_EQ(SIM_CALL(lib, RM_GetNumberOfLocalAdapters), SIM_CALL(lrmapi(), RM_GetNumberOfLocalAdapters));
+  EXPECT_GT(SIM_CALL(lib, RM_GetNumberOfLocalAdapters), 0u);
+  EXPECT_EQ(SIM_CALL(lib, RM_InitLib), 0u);
+}
+
 TEST(Symbols, RmOnlyFallbackKeepsTheLrmOnlyNames) {
   Library lib(library_path("sim-fallback-rmonly", "librmapi.so"));
   expect_management(lib, false);
