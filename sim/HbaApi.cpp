@@ -41,7 +41,8 @@ std::vector<FunctionRef> fcoe_functions(const Site& site) {
   std::vector<FunctionRef> out;
   for (size_t c = 0; c < site.cards.size(); ++c)
     for (size_t f = 0; f < site.cards[c].functions.size(); ++f)
-      if (site.cards[c].functions[f].kind == nrvsim::Kind::kFcoe) out.push_back({c, f});
+      if (site.cards[c].functions[f].kind == nrvsim::Kind::kFcoe && site.cards[c].functions[f].in_hba_api)
+        out.push_back({c, f});
   return out;
 }
 
@@ -125,16 +126,18 @@ HBA_API HBA_STATUS HBA_GetAdapterName(HBA_UINT32 index, char* name) {
   });
 }
 
+// A fault rule's "adapter" filter names the function the adapter name belongs to.
 HBA_API HBA_HANDLE HBA_OpenAdapter(char* name) {
   auto& sim = SimSite::instance();
-  if (sim.gate("HBA_OpenAdapter", HBA_HANDLE_INVALID)) return HBA_HANDLE_INVALID;
-  if (name == nullptr) return HBA_HANDLE_INVALID;
-  const std::string wanted(name, strnlen(name, 256));
+  const std::string wanted = name ? std::string(name, strnlen(name, 256)) : std::string();
   auto ref = sim.with([&](Site& s) -> std::optional<FunctionRef> {
     for (const FunctionRef& r : fcoe_functions(s))
       if (nrvsim::at(s, r).hba_name == wanted) return r;
     return std::nullopt;
   });
+  std::optional<Wwn> id;
+  if (ref) id = sim.with([&](Site& s) { return nrvsim::at(s, *ref).id; });
+  if (sim.gate("HBA_OpenAdapter", HBA_HANDLE_INVALID, id)) return HBA_HANDLE_INVALID;
   return ref ? sim.open_handle(*ref) : HBA_HANDLE_INVALID;
 }
 

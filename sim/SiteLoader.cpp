@@ -268,6 +268,7 @@ Function read_function(const Node& n, const Card& card) {
     f.wwnn = n.has("wwnn") ? n.wwn("wwnn") : f.id;
     f.fc_id = n.u32("fc_id", 0);
     f.fabric = n.has("fabric") ? n.wwn("fabric") : Wwn{};
+    f.in_hba_api = n.boolean("hba_api", true);
     f.fip.fcf_vlan = n.u16("fcoe_vlan", 1002);
     if (f.fip.fcf_vlan == 0 || f.fip.fcf_vlan > 4094) n.at("fcoe_vlan").fail("VLAN must be 1 to 4094");
   } else {
@@ -424,7 +425,7 @@ void finish(Site& site, const Node& root) {
       if (!ids.insert(f.id).second) where.fail("identifier " + wwn_plain(f.id) + " is used twice");
       for (auto& t : f.iscsi_targets)
         for (auto& session : t.sessions) session.id = site.next_session_id++;
-      if (f.kind == Kind::kFcoe) {
+      if (f.kind == Kind::kFcoe && f.in_hba_api) {
         f.hba_name = "com.norvane-" + card.model + "-" + std::to_string(hba_index++);
       }
     }

@@ -210,6 +210,7 @@ struct Function {
   IscsiInitiator initiator;
   std::vector<IscsiTarget> iscsi_targets;
   std::string hba_name;  // HBA API adapter name (FCoE), set by the loader
+  bool in_hba_api = true;  // FCoE: listed by the HBA API library
   FipSettings fip;
   QosLimits qos;
 };

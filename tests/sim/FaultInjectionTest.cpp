@@ -81,6 +81,17 @@ TEST_F(FaultInjection, CheckConditionForOneLunOnly) {
   SIM_CALL(hbaapi(), HBA_CloseAdapter, h);
 }
 
+TEST_F(FaultInjection, OpenFailsForOneAdapterOnly) {
+  load(R"([{"function": "HBA_OpenAdapter", "status": 0, "adapter": "10:00:00:90:fa:5c:2e:16"}])");
+  char first[256] = {}, second[256] = {};
+  ASSERT_EQ(SIM_CALL(hbaapi(), HBA_GetAdapterName, 0, first), 0u);
+  ASSERT_EQ(SIM_CALL(hbaapi(), HBA_GetAdapterName, 1, second), 0u);
+  const HBA_HANDLE h = SIM_CALL(hbaapi(), HBA_OpenAdapter, first);
+  EXPECT_NE(h, 0u);
+  EXPECT_EQ(SIM_CALL(hbaapi(), HBA_OpenAdapter, second), 0u);
+  SIM_CALL(hbaapi(), HBA_CloseAdapter, h);
+}
+
 TEST_F(FaultInjection, DelayIsSpentAndTheAnswerIsStillReal) {
   load(R"([{"function": "RM_GetNumberOfLocalAdapters", "delay_ms": 30}])");
   const auto start = std::chrono::steady_clock::now();

@@ -4,6 +4,8 @@
 #include <gtest/gtest.h>
 
 #include <cstring>
+#include <fstream>
+#include <sstream>
 #include <string>
 
 #include "SimLibrary.h"
@@ -144,6 +146,20 @@ TEST_F(HbaApi, ChangedWwnShowsInPortAttributes) {
   HBA_PORTATTRIBUTES port{};
   ASSERT_EQ(SIM_CALL(hbaapi(), HBA_GetAdapterPortAttributes, h, 0, &port), 0u);
   EXPECT_EQ(std::memcmp(port.PortWWN.wwn, fresh.wwn, 8), 0);
+}
+
+TEST_F(HbaApi, FunctionHiddenFromTheHbaApiHasNoAdapter) {
+  std::ifstream in(sample_site());
+  std::ostringstream text;
+  text << in.rdbuf();
+  std::string site = text.str();
+  const std::string second = "\"kind\": \"fcoe\", \"port\": 1,";
+  ASSERT_NE(site.find(second), std::string::npos);
+  site.replace(site.find(second), second.size(), "\"kind\": \"fcoe\", \"hba_api\": false, \"port\": 1,");
+  ASSERT_TRUE(nrvsim::SimSite::instance().reload(write_site("sim_hidden_site.json", site)));
+  EXPECT_EQ(SIM_CALL(hbaapi(), HBA_GetNumberOfAdapters), 1u);
+  // The management library still lists it.
+  EXPECT_EQ(SIM_CALL(lrmapi(), RM_GetNumberOfLocalAdapters), 10u);
 }
 
 TEST_F(HbaApi, CallbacksRegisterAndRemoveOnce) {
