@@ -36,8 +36,7 @@ void default_build_san_data(ProviderAgent& agent) {
   if (agent.m_pData) agent.m_pData->buildSANData();
 }
 void default_update_san_maps(ProviderAgent& agent) { agent.updateSANMaps(); }
-// Diagnostic jobs have no clean-up of their own yet; the map releases them.
-void default_release_diagnostic_jobs(ProviderAgent&) {}
+void default_release_diagnostic_jobs(ProviderAgent& agent) { agent.releaseDiagnosticJobs(); }
 
 }  // namespace
 
@@ -95,8 +94,10 @@ void ProviderAgent::releaseRef() {
   if (--s_RefCount > 0) return;
   // Destroyed under the agent mutex, so a provider loading meanwhile waits
   // for the old agent (sinks, libraries) to be gone before a new one starts.
-  ProviderAgent* agent = s_pAgent.exchange(nullptr, std::memory_order_acq_rel);
-  delete agent;
+  // The pointer stays published until then: code on the agent's own fetch
+  // thread, which the destructor joins, may still look the agent up.
+  delete s_pAgent.load(std::memory_order_relaxed);
+  s_pAgent.store(nullptr, std::memory_order_release);
 }
 
 // ---- construction ------------------------------------------------------------

@@ -108,6 +108,9 @@ class ProviderAgent {
   // The catalogue builders (see Catalogue_Update.cpp); m_DataMutex held.
   void updateAdapterMaps();
   void updateSANMaps();
+  // Hands every diagnostic job to its clean-up; run by the destructor with
+  // m_DataMutex held.
+  void releaseDiagnosticJobs();
 
   // Fill the driver-log holders from the system log.
   void logFCDriverEvents();
@@ -118,7 +121,7 @@ class ProviderAgent {
   std::atomic<bool> m_bBuildAdapterData{true};
   std::atomic<bool> m_bRefreshAdapterData{false};
   std::atomic<bool> m_bBuildSANData{false};
-  std::atomic<bool> m_bRefreshSANData{true};
+  std::atomic<bool> m_bRefreshSANData{false};
   std::atomic<int32_t> m_CacheTimeout{10};  // minutes
   std::atomic<bool> m_bIsLoaded{false};
 

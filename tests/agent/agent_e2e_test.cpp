@@ -1,0 +1,61 @@
+// The provider settings end to end: the module loaded by the CIMOM stand-in,
+// requests through its command-line client, the simulated site behind it.
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include "AgentTestSupport.h"
+#include "agent/NrvConfigFile.h"
+#include "host/CimClient.h"
+
+namespace nrv_test {
+namespace {
+
+struct Reply {
+  int status;
+  std::string out, err;
+};
+
+Reply cim(std::vector<std::string> args) {
+  args.insert(args.begin(), {"-m", std::getenv("NRV_MODULE")});
+  std::ostringstream out, err;
+  const int status = nrv::host::runCimClient(args, out, err);
+  return {status, out.str(), err.str()};
+}
+
+const std::string kTimeout = "NRVTAVO_ProviderConfigSetting.InstanceID=\"Norvane TAVO Provider:cachetimeout\"";
+const std::string kSanRefresh = "NRVTAVO_ProviderConfigSetting.InstanceID=\"Norvane TAVO Provider:sanrefresh\"";
+
+TEST(AgentEndToEnd, ProviderSettingsAreReadAndModifiedThroughCMPI) {
+  ASSERT_NE(std::getenv("NRV_MODULE"), nullptr);
+  remove_file(sysroot_path(cimple::kNrvConfigFile));
+
+  Reply all = cim({"ei", "NRVTAVO_ProviderConfigSetting"});
+  ASSERT_EQ(all.status, 0) << all.err;
+  EXPECT_NE(all.out.find("InstanceID = \"Norvane TAVO Provider:cachetimeout\";"), std::string::npos);
+  EXPECT_NE(all.out.find("InstanceID = \"Norvane TAVO Provider:adapterrefresh\";"), std::string::npos);
+  EXPECT_NE(all.out.find("InstanceID = \"Norvane TAVO Provider:sanrefresh\";"), std::string::npos);
+  EXPECT_NE(all.out.find("current = 10;"), std::string::npos);
+
+  Reply changed = cim({"mi", kTimeout, "current=3"});
+  EXPECT_EQ(changed.status, 0) << changed.err;
+  Reply one = cim({"gi", kTimeout});
+  ASSERT_EQ(one.status, 0) << one.err;
+  EXPECT_NE(one.out.find("current = 3;"), std::string::npos) << one.out;
+
+  Reply refused = cim({"mi", kTimeout, "current=31"});
+  EXPECT_EQ(refused.status, 1);
+  EXPECT_NE(refused.err.find("CMPI_RC_ERR_INVALID_PARAMETER"), std::string::npos) << refused.err;
+  Reply san = cim({"mi", kSanRefresh, "current=2"});
+  EXPECT_EQ(san.status, 1);
+  EXPECT_NE(san.err.find("CMPI_RC_ERR_INVALID_PARAMETER"), std::string::npos) << san.err;
+  // The accepted value reached the file when the module let its agent go.
+  EXPECT_NE(read_file(sysroot_path(cimple::kNrvConfigFile)).find("NRV_PROVIDER_CACHE_TIMEOUT = 3\n"),
+            std::string::npos);
+}
+
+}  // namespace
+}  // namespace nrv_test
