@@ -26,7 +26,6 @@ namespace {
 std::atomic<ProviderAgent*> s_pAgent{nullptr};
 int32_t s_RefCount = 0;
 std::mutex s_AgentMutex;
-Catalogue_Builders s_Builders = ProviderAgent::defaultBuilders();  // guarded by s_AgentMutex
 
 void default_build_adapter_data(ProviderAgent& agent) {
   if (agent.m_pData) agent.m_pData->buildAdapterData();
@@ -38,12 +37,15 @@ void default_build_san_data(ProviderAgent& agent) {
 void default_update_san_maps(ProviderAgent& agent) { agent.updateSANMaps(); }
 void default_release_diagnostic_jobs(ProviderAgent& agent) { agent.releaseDiagnosticJobs(); }
 
+constexpr Catalogue_Builders kDefaultBuilders = {default_build_adapter_data, default_update_adapter_maps,
+                                                 default_build_san_data, default_update_san_maps,
+                                                 default_release_diagnostic_jobs};
+// Constant-initialised, so ready before any static initialiser could load a provider.
+Catalogue_Builders s_Builders = kDefaultBuilders;  // guarded by s_AgentMutex
+
 }  // namespace
 
-Catalogue_Builders ProviderAgent::defaultBuilders() {
-  return {default_build_adapter_data, default_update_adapter_maps, default_build_san_data,
-          default_update_san_maps, default_release_diagnostic_jobs};
-}
+Catalogue_Builders ProviderAgent::defaultBuilders() { return kDefaultBuilders; }
 
 void ProviderAgent::useBuilders(const Catalogue_Builders& builders) {
   std::lock_guard<std::mutex> lock(s_AgentMutex);
