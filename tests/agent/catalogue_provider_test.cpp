@@ -2,6 +2,8 @@
 // procedure: enumeration of clones, the duplicate-key and empty-map answers,
 // get instance through the enumeration fallback, and everything else
 // unsupported.
+#include <stdexcept>
+
 #include "AgentFixture.h"
 #include "logging/Log.h"
 #include "derivedObjects/Catalogue_Provider.h"
@@ -78,6 +80,35 @@ TEST_F(CatalogueProviderTest, TwoInstancesWithEqualKeysDeliverNothing) {
     }
   }
   EXPECT_TRUE(capture.contains("NRVTAVO_Chip_Provider::enum_instances()"));
+}
+
+// A failure inside the enumeration (here the handler throwing) is logged
+// and the answer is still success.
+bool throwing_handler(Instance* instance, int, void*) {
+  if (instance == nullptr) return true;
+  unref(instance);
+  throw std::runtime_error("handler failed");
+}
+
+TEST_F(CatalogueProviderTest, AnExceptionIsLoggedAndTheAnswerIsStillSuccess) {
+  EXPECT_EQ(chip->handle().enum_instances(nullptr, &throwing_handler, nullptr), ENUM_INSTANCES_OK);
+  EXPECT_EQ(capture.count("Exception in CIM Provider Enumeration - do nothing", NRV_CRIT), 1);
+  EXPECT_TRUE(capture.contains("NRVTAVO_Chip_Provider::enum_instances()"));
+
+  auto disk = make_slot<Catalogue_Provider<NRVTAVO_LogicalDisk>, NRVTAVO_LogicalDisk>();
+  ASSERT_EQ(disk->load(), LOAD_OK);
+  EXPECT_EQ(disk->handle().enum_instances(nullptr, &throwing_handler, nullptr), ENUM_INSTANCES_OK);
+  EXPECT_EQ(capture.count("Exception in SAN CIM Provider Enumeration - do nothing", NRV_CRIT), 1);
+  for (const auto& e : capture.entries()) {
+    if (e.message.rfind("Exception in", 0) == 0) {
+      EXPECT_EQ(e.file, "ProviderAgent.h");
+    }
+  }
+  // The locks were released: the next enumeration goes through.
+  Collected all;
+  chip->enumerate(all);
+  EXPECT_TRUE(one_generation(all, 6));
+  disk->unload();
 }
 
 TEST_F(CatalogueProviderTest, GetInstanceFindsByKeyThroughTheEnumeration) {
