@@ -9,7 +9,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <fstream>
-#include <iterator>
 
 namespace nrv::host {
 
@@ -50,8 +49,11 @@ const char* miKindSuffix(MiKind kind) {
 }
 
 std::vector<std::string> exportedFunctions(const std::string& path) {
-  std::ifstream in(path, std::ios::binary);
-  std::vector<char> file((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+  // One bulk read: a sanitizer build of the module is large, and reading it
+  // character by character cost seconds per load.
+  std::ifstream in(path, std::ios::binary | std::ios::ate);
+  std::vector<char> file(in ? static_cast<size_t>(in.tellg()) : 0);
+  if (!in.seekg(0).read(file.data(), static_cast<std::streamsize>(file.size()))) file.clear();
   std::vector<std::string> names;
   Elf64_Ehdr eh;
   if (!readAt(file, 0, eh) || std::memcmp(eh.e_ident, ELFMAG, SELFMAG) != 0 ||

@@ -10,14 +10,8 @@ export NRV_SITE="${NRV_SITE:-$top/sim/sites/sample.json}"
 export LD_LIBRARY_PATH="$build/lib/sim${LD_LIBRARY_PATH:+:$LD_LIBRARY_PATH}"
 mkdir -p "$NRV_SYSROOT/etc" "$NRV_SYSROOT/var/log" "$NRV_SYSROOT/opt/kelvar/platform/log"
 
-cli="$build/bin/nrv-cim"
-module="$build/lib/libnorvane_tavo_provider.so"
-if [ ! -x "$cli" ]; then
-  echo "The host is not built yet; the module registers these providers:"
-  nm -D --defined-only "$module" | awk '/_Provider_Create_InstanceMI$/ {sub(/_Provider_Create_InstanceMI$/, "", $3); print "  " $3}'
-  exit 0
-fi
-for class in NRVTAVO_Card NRVTAVO_PortController NRVTAVO_EthernetPort NRVTAVO_FCPort NRVTAVO_SoftwareIdentity; do
-  echo "== $class"
-  "$cli" -m "$module" ei "root/norvane:$class"
-done
+echo "== Adapter inventory (the module's discovery over the site $NRV_SITE)"
+"$build/bin/nrv-inventory"
+echo
+echo "== The module inside the host: its settings instance through CMPI"
+"$build/bin/nrv-cim" -m "$build/lib/libnorvane_tavo_provider.so" ei root/norvane:NRVTAVO_ProviderConfigSetting
