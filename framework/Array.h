@@ -98,7 +98,9 @@ class Array {
     --rep_->size;
   }
   void clear() noexcept { release(); }
-  void reserve(uint32_t n) { detach(n); }
+  void reserve(uint32_t n) {
+    if (n) detach(n);
+  }
 
   // A new, unshared array with copies of the elements.
   Array deep_copy() const {
@@ -122,6 +124,7 @@ class Array {
     uint32_t capacity;
   };
   static constexpr size_t kHeader = (sizeof(Rep) + alignof(T) + 7) / 8 * 8;
+  static constexpr size_t kMinCapacity = 4;
 
   T* elements() const noexcept {
     return reinterpret_cast<T*>(reinterpret_cast<char*>(rep_) + kHeader);
@@ -135,8 +138,8 @@ class Array {
     if (capacity < min_capacity) {
       size_t doubled = capacity * 2;
       capacity = min_capacity > doubled ? min_capacity : doubled;
-      if (capacity < 4) capacity = 4;
     }
+    if (capacity < kMinCapacity) capacity = kMinCapacity;
     void* mem = std::malloc(kHeader + sizeof(T) * capacity);
     if (mem == nullptr) throw std::bad_alloc();
     Rep* fresh = new (mem) Rep;
