@@ -1,0 +1,60 @@
+// The real module in the host: it loads, every provider's factories resolve
+// and make MIs, and a catalogue-backed class answers an empty success
+// through the nrv-cim client.
+#include <cstdlib>
+#include <set>
+
+#include "schema/ProviderClasses.h"
+#include "tests/e2e/E2E_Fixture.h"
+#include "tests/host/HostTestSupport.h"
+
+namespace e2e {
+namespace {
+
+#define NRV_NAME(C) #C,
+const std::vector<std::string> all_classes = {NRV_FOR_EACH_PROVIDER_CLASS(NRV_NAME)};
+const std::vector<std::string> association_classes = {NRV_FOR_EACH_ASSOCIATION_PROVIDER_CLASS(NRV_NAME)};
+#undef NRV_NAME
+
+std::string real_module() {
+  const char* path = std::getenv("NRV_MODULE");
+  return path ? path : "";
+}
+
+TEST(RealModule, LoadsAndEveryProvidersFactoriesResolve) {
+  ASSERT_NE(std::getenv("NRV_SYSROOT"), nullptr);
+  Host host(real_module());
+  ASSERT_TRUE(host.moduleLoaded()) << host.loadError();
+  ASSERT_FALSE(all_classes.empty());
+  std::set<std::string> associations(association_classes.begin(), association_classes.end());
+  for (const std::string& c : all_classes) {
+    EXPECT_TRUE(host.resolves(c + "_Provider_Create_InstanceMI")) << c;
+    EXPECT_TRUE(host.resolves(c + "_Provider_Create_MethodMI")) << c;
+    EXPECT_EQ(host.resolves(c + "_Provider_Create_AssociationMI"), associations.count(c) == 1) << c;
+  }
+  // The factories the host lists are exactly those of the provider classes.
+  size_t expected = 2 * 2 * all_classes.size() + 2 * associations.size();
+  EXPECT_EQ(host.factorySymbols().size(), expected);
+}
+
+TEST(RealModule, EveryProviderMakesItsMisAndCleansUp) {
+  Host host(real_module());
+  ASSERT_TRUE(host.moduleLoaded()) << host.loadError();
+  for (const std::string& c : all_classes) {
+    ClassMis mis = host.mis(c);
+    EXPECT_NE(mis.instance, nullptr) << c;
+    EXPECT_NE(mis.method, nullptr) << c;
+  }
+  host.shutdown();
+  for (const CleanupRecord& record : host.cleanupRecords()) EXPECT_EQ(record.rc, CMPI_RC_OK) << record.factory;
+}
+
+TEST(RealModule, ChipEnumerationThroughTheClientAnswersAnEmptySuccess) {
+  auto run = nrv::host::test::runClient({"-m", real_module(), "ei", "root/norvane:NRVTAVO_Chip"});
+  EXPECT_EQ(run.status, 0) << run.err;
+  EXPECT_EQ(run.out.find("instance of"), std::string::npos) << run.out;
+  EXPECT_EQ(run.err.find("CMPI_RC_ERR"), std::string::npos) << run.err;
+}
+
+}  // namespace
+}  // namespace e2e
