@@ -2,11 +2,13 @@
 // the return value both ways, method names matched without case, text
 // converted for a uint16 parameter, and an unknown method named back.
 #include "tests/e2e/E2E_Fixture.h"
+#include "tests/host/HostTestSupport.h"
 
 namespace e2e {
 namespace {
 
 using Methods = E2E_Test;
+using nrv::host::test::runClient;
 
 TEST_F(Methods, ParametersArriveAndOutputsComeBack) {
   Result result = host_->invokeMethod(service_path("svc"), "RequestStateChange",
@@ -41,6 +43,20 @@ TEST_F(Methods, TextForAUint16ParameterIsConverted) {
   ASSERT_TRUE(missing.ok()) << missing.errorText();
   EXPECT_TRUE(module_store().requested_state_null);
   EXPECT_EQ(missing.returnValue.asInteger(), 32969);
+}
+
+// nrv-cim sends untyped arguments as text: the number reaches the uint16
+// parameter, anything else leaves it null (the method then answers 32969).
+TEST_F(Methods, TheClientsTextArgumentsReachTheUint16Parameter) {
+  const std::string path =
+      "root/norvane:NRVTAVO_ChannelMgmtService.SystemCreationClassName=\"CIM_ComputerSystem\","
+      "SystemName=\"host\",CreationClassName=\"NRVTAVO_ChannelMgmtService\",Name=\"svc\"";
+  auto number = runClient({"-m", test_module(), "cm", path, "RequestStateChange", "RequestedState=5"});
+  EXPECT_EQ(number.status, 0) << number.err;
+  EXPECT_NE(number.out.find("ReturnValue = 0;"), std::string::npos) << number.out;
+  auto text = runClient({"-m", test_module(), "cm", path, "RequestStateChange", "RequestedState=abc"});
+  EXPECT_EQ(text.status, 0) << text.err;
+  EXPECT_NE(text.out.find("ReturnValue = 32969;"), std::string::npos) << text.out;
 }
 
 TEST_F(Methods, AnUnknownMethodAnswersMethodNotFoundWithItsName) {
