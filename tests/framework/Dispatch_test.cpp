@@ -71,7 +71,7 @@ class Port_Provider : public Provider_Base {
     return INVOKE_METHOD_OK;
   }
   static std::span<const Method_Entry<Port_Provider>> methods() {
-    static const Method_Entry<Port_Provider> table[] = {{"RequestStateChange", &Port_Provider::request_state_change}};
+    static const Method_Entry<Port_Provider> table[] = {{"requestSTATEchange", &Port_Provider::request_state_change}};
     return table;
   }
   static uint32_t last_offset(const Instance* call) {
