@@ -1,7 +1,9 @@
 #include "framework/CMPI_Adapter.h"
 
 #include <cstdio>
+#include <memory>
 #include <mutex>
+#include <unordered_map>
 
 #include "framework/Trace_File.h"
 
@@ -9,11 +11,19 @@ namespace cimple {
 
 namespace {
 
-// Guards every record's adapter pointer and load count between factory
-// calls and cleanups, which the CIMOM may run on different threads.
-std::mutex& records_mutex() {
-  static std::mutex mutex;
-  return mutex;
+// Guards one record's adapter pointer and load count between factory calls
+// and cleanups, which the CIMOM may run on different threads.  One lock per
+// record, and recursive: a provider's load() may make broker calls that make
+// the CIMOM create other providers (or this one's other MI objects) on the
+// same thread, and a global lock held across load() would deadlock with
+// calls running in other providers.
+std::recursive_mutex& record_mutex(const CMPI_Static_Data* record) {
+  static std::mutex table_mutex;
+  static std::unordered_map<const CMPI_Static_Data*, std::unique_ptr<std::recursive_mutex>> table;
+  std::lock_guard<std::mutex> lock(table_mutex);
+  auto& entry = table[record];
+  if (!entry) entry = std::make_unique<std::recursive_mutex>();
+  return *entry;
 }
 
 struct Rc_Name {
@@ -123,8 +133,9 @@ void CMPI_Adapter::deactivate_filter(const std::string& name_space) { filters_.e
 
 CMPIStatus CMPI_Adapter::cleanup(CMPI_Static_Data* record, const CMPIContext* context, CMPIBoolean terminating,
                                  const char* function) {
-  std::lock_guard<std::mutex> records(records_mutex());
-  CMPI_Adapter* adapter = record ? record->adapter : nullptr;
+  if (record == nullptr) return CMPIStatus{CMPI_RC_OK, nullptr};
+  std::lock_guard<std::recursive_mutex> records(record_mutex(record));
+  CMPI_Adapter* adapter = record->adapter;
   if (adapter == nullptr) return CMPIStatus{CMPI_RC_OK, nullptr};
   CMPIrc rc = CMPI_RC_OK;
   bool destroy = false;
@@ -196,7 +207,7 @@ extern "C" int cimple_cmpi_adapter(int, cimple::CMPI_Static_Data* record,
              registration->meta_class == nullptr || mi == nullptr) {
     result = -1;
   } else {
-    std::lock_guard<std::mutex> records(records_mutex());
+    std::lock_guard<std::recursive_mutex> records(cimple::record_mutex(record));
     if (record->adapter == nullptr)
       record->adapter = new CMPI_Adapter(record, registration, broker, context, provider_name);
     else
