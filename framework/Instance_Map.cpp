@@ -1,5 +1,6 @@
 #include "framework/Instance_Map.h"
 
+#include <algorithm>
 #include <cstring>
 #include <functional>
 #include <string_view>
@@ -61,10 +62,17 @@ size_t key_hash(const Instance* instance) {
 }
 
 long Instance_Map::find(const Instance* keys) const {
-  if (keys == nullptr) return -1;
-  auto range = index_.equal_range(key_hash(keys));
-  for (auto it = range.first; it != range.second; ++it)
-    if (key_eq(instances_[it->second], keys)) return static_cast<long>(it->second);
+  return keys == nullptr ? -1 : find(keys, key_hash(keys));
+}
+
+long Instance_Map::find(const Instance* keys, size_t hash) const {
+  if (index_.empty()) return -1;
+  const size_t mask = index_.size() - 1;
+  for (size_t i = hash & mask; index_[i].position_plus_one; i = (i + 1) & mask) {
+    const Slot& slot = index_[i];
+    if (slot.hash == hash && key_eq(instances_[slot.position_plus_one - 1], keys))
+      return static_cast<long>(slot.position_plus_one - 1);
+  }
   return -1;
 }
 
@@ -74,10 +82,26 @@ Instance* Instance_Map::lookup(const Instance* keys) const {
 }
 
 long Instance_Map::insert(Instance* instance) {
-  if (instance == nullptr || find(instance) >= 0) return -1;
+  if (instance == nullptr) return -1;
+  const size_t hash = key_hash(instance);
+  if (find(instance, hash) >= 0) return -1;
   instances_.push_back(instance);
-  index_.emplace(key_hash(instance), instances_.size() - 1);
+  index(hash, instances_.size() - 1);
   return static_cast<long>(instances_.size() - 1);
+}
+
+void Instance_Map::index(size_t hash, size_t position) {
+  if ((instances_.size()) * 2 > index_.size()) {
+    // Grow and re-place every slot by its stored hash; no instance is read.
+    std::vector<Slot> old(std::max<size_t>(16, index_.size() * 2));
+    old.swap(index_);
+    for (const Slot& slot : old)
+      if (slot.position_plus_one) index(slot.hash, slot.position_plus_one - 1);
+  }
+  const size_t mask = index_.size() - 1;
+  size_t i = hash & mask;
+  while (index_[i].position_plus_one) i = (i + 1) & mask;
+  index_[i] = Slot{hash, static_cast<uint32_t>(position + 1)};
 }
 
 int Instance_Map::get_instance(const Instance* keys, Instance*& instance) const {
@@ -129,7 +153,7 @@ void Instance_Map::clear() {
 
 void Instance_Map::rebuild_index() {
   index_.clear();
-  for (size_t i = 0; i < instances_.size(); ++i) index_.emplace(key_hash(instances_[i]), i);
+  for (size_t i = 0; i < instances_.size(); ++i) index(key_hash(instances_[i]), i);
 }
 
 }  // namespace cimple

@@ -1,7 +1,8 @@
 // cimple::Instance_Map: the instances of one class in insertion order, owned
 // by the map, answering provider operations with the provider result codes.
-// Look-ups go through a hash index over the key values, so n inserts and n
-// look-ups cost O(n); equality is still decided by key_eq.
+// Look-ups go through an open-addressing index of key hashes, so n inserts and
+// n look-ups cost O(n) and touch a stored instance only when its hash matches;
+// equality is still decided by key_eq.
 //
 // Not synchronised: the owner serialises access.  Instances handed out are
 // clones; instances handed in are taken over (insert) or copied (create).
@@ -9,7 +10,6 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <unordered_map>
 #include <vector>
 
 #include "framework/Instance.h"
@@ -50,11 +50,18 @@ class Instance_Map {
   void clear();
 
  private:
+  struct Slot {
+    size_t hash;
+    uint32_t position_plus_one;  // 0: empty
+  };
+  // Position of the instance with keys equal to `keys` (hash `hash`), or -1.
+  long find(const Instance* keys, size_t hash) const;
+  void index(size_t hash, size_t position);
   void rebuild_index();
 
   const Meta_Class* meta_class_;
   std::vector<Instance*> instances_;
-  std::unordered_multimap<size_t, size_t> index_;  // key hash -> position
+  std::vector<Slot> index_;  // power-of-two size, at most half full
 };
 
 }  // namespace cimple
