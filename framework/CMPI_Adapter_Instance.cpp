@@ -26,6 +26,16 @@ CMPIrc request_model(const CMPI_Call& call, const CMPIObjectPath* path, const st
   return rc;
 }
 
+// The model of a read request: the key instance of the path with the
+// property list applied (keys kept: they identify what is wanted).
+CMPIrc read_model(const CMPI_Call& call, const CMPIObjectPath* path, const std::string& ns,
+                  const CMPIResult* rslt, const char** properties, Instance_Ptr& model) {
+  if (CMPIrc rc = request_model(call, path, ns, model); rc != CMPI_RC_OK) return rc;
+  if (rslt == nullptr) return CMPI_RC_ERR_INVALID_PARAMETER;
+  if (apply_property_list(model.get(), properties, true) != 0) return CMPI_RC_ERR_INVALID_PARAMETER;
+  return CMPI_RC_OK;
+}
+
 CMPIStatus enum_instance_names(CMPIInstanceMI* mi, const CMPIContext* ctx, const CMPIResult* rslt,
                                const CMPIObjectPath* path) {
   CMPI_Call call("enumInstanceNames", mi ? mi->hdl : nullptr, ctx);
@@ -52,9 +62,7 @@ CMPIStatus enum_instances(CMPIInstanceMI* mi, const CMPIContext* ctx, const CMPI
   return run(call, [&]() -> CMPIStatus {
     const std::string ns = name_space_of(path);
     Instance_Ptr model;
-    if (CMPIrc rc = request_model(call, path, ns, model); rc != CMPI_RC_OK) return call.finish(rc);
-    if (rslt == nullptr) return call.finish(CMPI_RC_ERR_INVALID_PARAMETER);
-    if (apply_property_list(model.get(), properties, true) != 0) return call.finish(CMPI_RC_ERR_INVALID_PARAMETER);
+    if (CMPIrc rc = read_model(call, path, ns, rslt, properties, model); rc != CMPI_RC_OK) return call.finish(rc);
     CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), properties};
     int result = call.adapter()->handle().enum_instances(model.get(), deliver_instance, &delivery);
     CMPIrc rc = map_result(result, {{ENUM_INSTANCES_FAILED, CMPI_RC_ERR_FAILED},
@@ -72,10 +80,7 @@ CMPIStatus get_instance(CMPIInstanceMI* mi, const CMPIContext* ctx, const CMPIRe
   return run(call, [&]() -> CMPIStatus {
     const std::string ns = name_space_of(path);
     Instance_Ptr model;
-    if (CMPIrc rc = request_model(call, path, ns, model); rc != CMPI_RC_OK) return call.finish(rc);
-    if (rslt == nullptr) return call.finish(CMPI_RC_ERR_INVALID_PARAMETER);
-    // The keys stay: they are what identifies the instance wanted.
-    if (apply_property_list(model.get(), properties, true) != 0) return call.finish(CMPI_RC_ERR_INVALID_PARAMETER);
+    if (CMPIrc rc = read_model(call, path, ns, rslt, properties, model); rc != CMPI_RC_OK) return call.finish(rc);
     Instance* found = nullptr;
     int result = call.adapter()->handle().get_instance(model.get(), found);
     Instance_Ptr instance(found);
