@@ -14,7 +14,7 @@
 #include <iterator>
 #include <new>
 
-#include "access/NRV_SystemPaths.h"
+#include "logging/NRV_SystemPaths.h"
 #include "logging/Log.h"
 
 namespace cimple {

@@ -5,8 +5,7 @@
 // agent ends.  insertProviderConfigSettings builds the three instances.
 #pragma once
 
-#include "derivedObjects/Catalogue_Provider.h"
-#include "framework/module/Provider_For.h"
+#include "agent/Catalogue_Provider.h"
 #include "schema/NRVTAVO_ProviderConfigSetting.h"
 
 namespace cimple {
@@ -25,11 +24,6 @@ class NRVTAVO_ProviderConfigSetting_Provider : public Catalogue_Provider<NRVTAVO
   // argument or an out-of-range value, MODIFY_INSTANCE_FAILED when there is
   // no such instance.
   int modify_instance(const Instance* model, const Instance* instance);
-};
-
-template <>
-struct Provider_For<NRVTAVO_ProviderConfigSetting> {
-  using type = NRVTAVO_ProviderConfigSetting_Provider;
 };
 
 }  // namespace cimple

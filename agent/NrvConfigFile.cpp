@@ -8,7 +8,7 @@
 #include <cstring>
 #include <memory>
 
-#include "access/NRV_SystemPaths.h"
+#include "logging/NRV_SystemPaths.h"
 #include "logging/Log.h"
 
 namespace cimple {

@@ -10,7 +10,7 @@
 #include "access/NRV_Common.h"
 #include "access/NRV_MethodWrapper.h"
 #include "access/NRV_Runtime_Loader.h"
-#include "access/NRV_SystemPaths.h"
+#include "logging/NRV_SystemPaths.h"
 #include "access/RM_Api.h"
 #include "data/NRV_Data.h"
 #include "logging/CLogger.h"

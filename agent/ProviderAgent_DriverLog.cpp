@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "access/NRV_SystemPaths.h"
+#include "logging/NRV_SystemPaths.h"
 #include "agent/ProviderAgent.h"
 #include "logging/Log.h"
 

@@ -10,7 +10,7 @@
 #include <optional>
 #include <vector>
 
-#include "access/NRV_SystemPaths.h"
+#include "logging/NRV_SystemPaths.h"
 #include "logging/CLogger.h"
 
 namespace cimple {

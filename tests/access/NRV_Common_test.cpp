@@ -12,7 +12,7 @@
 #include <gtest/gtest.h>
 
 #include "TestSupport.h"
-#include "access/NRV_SystemPaths.h"
+#include "logging/NRV_SystemPaths.h"
 
 using namespace cimple;
 using nrv_test::LogCapture;

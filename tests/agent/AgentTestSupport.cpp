@@ -10,7 +10,7 @@
 #include <sstream>
 #include <thread>
 
-#include "access/NRV_SystemPaths.h"
+#include "logging/NRV_SystemPaths.h"
 #include "agent/NRVTAVO_ProviderConfigSetting_Provider.h"
 #include "logging/CLogger.h"
 #include "logging/Log.h"

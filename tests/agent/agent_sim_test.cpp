@@ -7,10 +7,10 @@
 #include "AgentTestSupport.h"
 #include "agent/NrvConfigFile.h"
 #include "data/NRV_Data.h"
-#include "derivedObjects/Catalogue_Provider.h"
+#include "agent/Catalogue_Provider.h"
 #include "logging/Log.h"
 #include "logging/NRV_LogDataFile.h"
-#include "providers/Service_Providers.h"
+#include "module/Service_Providers.h"
 #include "schema/Classes.h"
 
 namespace nrv_test {

@@ -2,7 +2,7 @@
 // module entry macros, exactly as the real module registers its providers,
 // so the host loads it through the same factories and adapter records.
 // Two hooks let a test reach the module's store across dlopen.
-#include "framework/module/Module_Entry.h"
+#include "framework/Module_Entry.h"
 #include "tests/adapter/Test_Provider_Classes.h"
 
 NRV_PLAIN_MODULE_PROVIDER(NRVTAVO_Card, test::Card_Provider)

@@ -1,9 +1,9 @@
 // Provider_For<C>::type: which provider class serves CIM class C.  Every
 // class is catalogue-backed unless a service provider claims it with a
-// specialisation (see providers/Service_Providers.h).
+// specialisation (see module/Service_Providers.h).
 #pragma once
 
-#include "derivedObjects/Catalogue_Provider.h"
+#include "agent/Catalogue_Provider.h"
 
 namespace cimple {
 

@@ -1,4 +1,4 @@
-#include "access/NRV_SystemPaths.h"
+#include "logging/NRV_SystemPaths.h"
 
 #include <cstdlib>
 

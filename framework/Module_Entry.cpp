@@ -1,4 +1,4 @@
-#include "framework/module/Module_Entry.h"
+#include "framework/Module_Entry.h"
 
 namespace cimple {
 
