@@ -106,7 +106,9 @@ class ProviderAgent {
   void clearSANMaps();
 
   // The catalogue builders (see Catalogue_Update.cpp); m_DataMutex held.
-  void updateAdapterMaps();
+  // updateAdapterMaps answers 0, or 32769 when a failure ended the build
+  // early (what was built stays; the fetch marks the maps ready either way).
+  int updateAdapterMaps();
   void updateSANMaps();
   // Hands every diagnostic job to its clean-up; run by the destructor with
   // m_DataMutex held.

@@ -1,0 +1,71 @@
+#include "agent/Catalogue_Features.h"
+
+#include <exception>
+#include <iterator>
+
+namespace cimple {
+
+Instance* feature_transceiver(ProviderAgent&, const std::string&) { return nullptr; }
+int feature_create_vpd(ProviderAgent&, const std::string&) { return 1; }
+void feature_update_fru_to_card(ProviderAgent&, Instance*, const std::string&, const std::string&, size_t) {}
+int feature_update_fru_to_software(ProviderAgent&) { return 1; }
+void feature_driver_parameters(ProviderAgent&, const std::string&, bool) {}
+int feature_port_virtualization(ProviderAgent&) { return 1; }
+int feature_dump_service(ProviderAgent&) { return 1; }
+
+namespace {
+
+struct Feature_Row {
+  Feature feature;
+  Feature_Builder builder;  // null until the feature's catalogue is written
+  const char* success;
+  const char* failure;
+};
+
+// In the order of the Feature enumeration.
+constexpr Feature_Row kFeatures[] = {
+    {Feature::kPhy, nullptr, "10GBaseT feature created",
+     "10GBaseT feature is either Not Supported/Failed to Create the feature"},
+    {Feature::kNicSettingService, nullptr, "NIC Setting Service classes created",
+     "NIC Setting Service feature is either Not Supported/Failed to Create the feature"},
+    {Feature::kNicDriverLog, nullptr, "NIC driver log classes created",
+     "NIC driver log feature is either Not Supported/Failed to Create the feature"},
+    {Feature::kNicCee, nullptr, "CEE classes created for NIC port",
+     "CEE feature for NIC port is either Not Supported/Failed to Create the feature"},
+    {Feature::kDownPorts, nullptr, "Down Ethernet port classes created",
+     "Down Ethernet port feature is either Not Supported/Failed to Create the feature"},
+    {Feature::kFcPfcThrottle, nullptr, "PFC throttle classes created",
+     "PFC throttle feature is either Not Supported/Failed to Create the feature"},
+    {Feature::kFcDriverLog, nullptr, "FC driver log classes created",
+     "FC driver log feature is either Not Supported/Failed to Create the feature"},
+    {Feature::kFcFip, nullptr, "FIP classes created",
+     "FIP feature is either Not Supported/Failed to Create the feature"},
+    {Feature::kFcCee, nullptr, "CEE classes created for FCoE port",
+     "CEE feature for FCoE port is either Not Supported/Failed to Create the feature"},
+    {Feature::kDiagnostics, nullptr, "Diagnostic classes created", "Dignostic Test creation failed"},
+    {Feature::kSrIov, nullptr, "SR-IOV classes created", "CreateNICSrIovClasses failed"},
+    {Feature::kChannelManagement, nullptr, "MC parameters updated", "Updating MC parameters failed"},
+    {Feature::kIscsiCatalogue, nullptr, "iSCSI discovery succesful", "iSCSI discovery failed"},
+};
+static_assert(std::size(kFeatures) == static_cast<size_t>(Feature::kIscsiCatalogue) + 1);
+
+}  // namespace
+
+Feature_Result run_feature(Catalogue_Build& build, Feature feature, const Function_View* function) {
+  const Feature_Row& row = kFeatures[static_cast<size_t>(feature)];
+  if (row.builder == nullptr) {
+    NRV_LOG(NRV_DBG, "%s", row.failure);
+    return Feature_Result::kNotBuilt;
+  }
+  int status = 1;
+  try {
+    status = row.builder(build, function);
+  } catch (const std::exception& e) {
+    NRV_LOG(NRV_ERR, "%s: %s", row.failure, e.what());
+    return Feature_Result::kFailed;
+  }
+  NRV_LOG(NRV_DBG, "%s", status == 0 ? row.success : row.failure);
+  return status == 0 ? Feature_Result::kMade : Feature_Result::kFailed;
+}
+
+}  // namespace cimple
