@@ -130,8 +130,8 @@ iSCSIAdapter::iSCSIAdapter(const std::string& name, uint32_t number,
   build<iSCSIAdapterAttributes, iSCSIAdapterStatistics, iSCSIPort>(info);
 }
 
-void Adapter::findHbaApiName() {
-  m_HbaApiName = findHbaApiAdapterName(m_IdentifierText);
+void Adapter::findHbaApiName(HbaApiNameIndex* names) {
+  m_HbaApiName = names ? names->find(m_IdentifierText) : findHbaApiAdapterName(m_IdentifierText);
   NRV_DATA_LOG(NRV_DBG, "HBAAPI AdapterName:%s:RMAPI AdapterName%s", m_HbaApiName.c_str(),
                m_AdapterName.c_str());
 }
@@ -139,15 +139,16 @@ void Adapter::findHbaApiName() {
 // The FC and FCoE kinds first find their name in the HBA API, which target
 // discovery opens.
 FCoEAdapter::FCoEAdapter(const std::string& name, uint32_t number,
-                         const RM_LOCAL_HBA_INFO_V4& info)
+                         const RM_LOCAL_HBA_INFO_V4& info, HbaApiNameIndex* names)
     : Adapter(kFCoEAdapterKind, name, number, info) {
-  findHbaApiName();
+  findHbaApiName(names);
   build<FCoEAdapterAttributes, FCoEAdapterStatistics, FCoEPort>(info);
 }
 
-FCAdapter::FCAdapter(const std::string& name, uint32_t number, const RM_LOCAL_HBA_INFO_V4& info)
+FCAdapter::FCAdapter(const std::string& name, uint32_t number, const RM_LOCAL_HBA_INFO_V4& info,
+                     HbaApiNameIndex* names)
     : Adapter(kFCAdapterKind, name, number, info) {
-  findHbaApiName();
+  findHbaApiName(names);
   build<FCAdapterAttributes, FCAdapterStatistics, FCPort>(info);
 }
 

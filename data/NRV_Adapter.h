@@ -16,6 +16,7 @@
 
 #include "access/RM_Types.h"
 #include "data/NRV_AdapterAttributes.h"
+#include "data/NRV_HbaApiName.h"
 #include "data/NRV_Port.h"
 #include "data/NRV_Statistics.h"
 
@@ -70,8 +71,9 @@ class Adapter {
   template <class Attributes, class Statistics, class PortType>
   void build(const RM_LOCAL_HBA_INFO_V4& info);
 
-  // Looks the adapter up in the HBA API by its identifier (FC and FCoE).
-  void findHbaApiName();
+  // Looks the adapter up in the HBA API by its identifier (FC and FCoE),
+  // through `names` when given, else through a look-up of its own.
+  void findHbaApiName(HbaApiNameIndex* names);
 
  private:
   const AdapterKind& m_Kind;
@@ -89,9 +91,12 @@ class Adapter {
 
 // Each kind takes the adapter name, the instance index and the information
 // record (identifier in its first 8 bytes).
+// The FC and FCoE kinds also take the build's index of HBA API names (null:
+// the adapter reads the HBA API itself); it need not outlive the constructor.
 class FCAdapter : public Adapter {
  public:
-  FCAdapter(const std::string& name, uint32_t number, const RM_LOCAL_HBA_INFO_V4& info);
+  FCAdapter(const std::string& name, uint32_t number, const RM_LOCAL_HBA_INFO_V4& info,
+            HbaApiNameIndex* names = nullptr);
 };
 
 class NICAdapter : public Adapter {
@@ -106,7 +111,8 @@ class iSCSIAdapter : public Adapter {
 
 class FCoEAdapter : public Adapter {
  public:
-  FCoEAdapter(const std::string& name, uint32_t number, const RM_LOCAL_HBA_INFO_V4& info);
+  FCoEAdapter(const std::string& name, uint32_t number, const RM_LOCAL_HBA_INFO_V4& info,
+              HbaApiNameIndex* names = nullptr);
 };
 
 }  // namespace cimple

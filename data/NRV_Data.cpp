@@ -45,6 +45,7 @@ void Data::freeAllData() {
   }
   m_Adapters.clear();
   m_AdapterCount = 0;
+  m_HbaApiNames = HbaApiNameIndex();
   m_HasNicAdapter = m_HasFcoeAdapter = m_HasIscsiAdapter = false;
   NRV_DATA_LOG(NRV_DBG, "freeAllData: cleanExit");
 }
@@ -144,7 +145,7 @@ void Data::createAdapter(uint32_t index, const RM_LOCAL_HBA_INFO_V4& info) {
       m_Adapters.push_back(std::make_unique<iSCSIAdapter>(name, index, info));
       m_HasIscsiAdapter = true;
     } else {
-      m_Adapters.push_back(std::make_unique<FCoEAdapter>(name, index, info));
+      m_Adapters.push_back(std::make_unique<FCoEAdapter>(name, index, info, &m_HbaApiNames));
       m_HasFcoeAdapter = true;
       NRV_DATA_LOG(NRV_DBG, "Got FCOE adapter %d", i);
     }

@@ -17,6 +17,7 @@
 #include <vector>
 
 #include "data/NRV_Adapter.h"
+#include "data/NRV_HbaApiName.h"
 #include "data/NRV_Port.h"
 #include "data/NRV_Target.h"
 
@@ -55,6 +56,8 @@ class Data {
   void createAdapter(uint32_t index, const RM_LOCAL_HBA_INFO_V4& info);
 
   std::vector<std::unique_ptr<Adapter>> m_Adapters;
+  // The HBA API's adapter names, read once per build for all FCoE functions.
+  HbaApiNameIndex m_HbaApiNames;
   uint32_t m_AdapterCount = 0;
   bool m_HasNicAdapter = false;
   bool m_HasFcoeAdapter = false;

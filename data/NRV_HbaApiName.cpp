@@ -9,33 +9,8 @@
 
 namespace cimple {
 
-namespace {
-
-// Whether a port of the open adapter carries `identifierText`.
-bool hasMatchingPort(HBA_HANDLE handle, const std::string& identifierText) {
-  HBA_ADAPTERATTRIBUTES attributes;
-  memset(&attributes, 0, sizeof attributes);
-  if (HBA_GetAdapterAttributes(handle, &attributes) != HBA_STATUS_OK) return false;
-  for (HBA_UINT32 p = 0; p < attributes.NumberOfPorts; ++p) {
-    HBA_PORTATTRIBUTES port;
-    memset(&port, 0, sizeof port);
-    if (HBA_GetAdapterPortAttributes(handle, p, &port) != HBA_STATUS_OK) continue;
-    char hbaText[kHbaNamePlainSize] = {};
-    HBAName2string(port.PortWWN, hbaText);
-    NRV_DATA_LOG(NRV_DBG, "matching rmapi wwpn:%s with hbaapi wwpn:%s", identifierText.c_str(),
-                 hbaText);
-    if (strncmp(identifierText.c_str(), hbaText, 32) == 0) {
-      NRV_DATA_LOG(NRV_DBG, "match succesful");
-      return true;
-    }
-  }
-  return false;
-}
-
-}  // namespace
-
-std::string findHbaApiAdapterName(const std::string& identifierText) {
-  NRV_DATA_LOG(NRV_DBG, "FCoEAdapter");
+void HbaApiNameIndex::read() {
+  read_ = true;
   const HBA_UINT32 count = HBA_GetNumberOfAdapters();
   if (count == 0) NRV_DATA_LOG(NRV_DBG, "HBAAPI reports that there are NO HBAs in the system.");
   for (HBA_UINT32 a = 0; a < count; ++a) {
@@ -47,15 +22,40 @@ std::string findHbaApiAdapterName(const std::string& identifierText) {
       continue;
     }
     name[sizeof name - 1] = '\0';
-    // Each handle is closed once its ports are compared.
+    // Each handle is closed once its ports are read.
     HbaAdapterHandle handle(name);
     if (handle.get() == 0) {
       NRV_DATA_LOG(NRV_DBG, "HBA_OpenAdapter(%s) failed", name);
       continue;
     }
-    if (hasMatchingPort(handle.get(), identifierText)) return name;
+    HBA_ADAPTERATTRIBUTES attributes;
+    memset(&attributes, 0, sizeof attributes);
+    if (HBA_GetAdapterAttributes(handle.get(), &attributes) != HBA_STATUS_OK) continue;
+    for (HBA_UINT32 p = 0; p < attributes.NumberOfPorts; ++p) {
+      HBA_PORTATTRIBUTES port;
+      memset(&port, 0, sizeof port);
+      if (HBA_GetAdapterPortAttributes(handle.get(), p, &port) != HBA_STATUS_OK) continue;
+      char text[kHbaNamePlainSize] = {};
+      HBAName2string(port.PortWWN, text);
+      names_.emplace(text, name);
+    }
   }
-  return std::string();
+}
+
+std::string HbaApiNameIndex::find(const std::string& identifierText) {
+  NRV_DATA_LOG(NRV_DBG, "FCoEAdapter");
+  if (!read_) read();
+  // The identifier is compared over at most 32 characters, as its text form allows.
+  const auto it = names_.find(identifierText.substr(0, 32));
+  if (it == names_.end()) return std::string();
+  NRV_DATA_LOG(NRV_DBG, "matching rmapi wwpn:%s with hbaapi wwpn:%s", identifierText.c_str(), it->first.c_str());
+  NRV_DATA_LOG(NRV_DBG, "match succesful");
+  return it->second;
+}
+
+std::string findHbaApiAdapterName(const std::string& identifierText) {
+  HbaApiNameIndex index;
+  return index.find(identifierText);
 }
 
 }  // namespace cimple
