@@ -17,13 +17,13 @@ namespace {
 
 struct Feature_Row {
   Feature feature;
-  Feature_Builder builder;  // null until the feature's catalogue is written
+  Feature_Builder builder;  // null until the feature registers its builder
   const char* success;
   const char* failure;
 };
 
 // In the order of the Feature enumeration.
-constexpr Feature_Row kFeatures[] = {
+Feature_Row kFeatures[] = {
     {Feature::kPhy, nullptr, "10GBaseT feature created",
      "10GBaseT feature is either Not Supported/Failed to Create the feature"},
     {Feature::kNicSettingService, nullptr, "NIC Setting Service classes created",
@@ -50,6 +50,10 @@ constexpr Feature_Row kFeatures[] = {
 static_assert(std::size(kFeatures) == static_cast<size_t>(Feature::kIscsiCatalogue) + 1);
 
 }  // namespace
+
+void set_feature_builder(Feature feature, Feature_Builder builder) {
+  kFeatures[static_cast<size_t>(feature)].builder = builder;
+}
 
 Feature_Result run_feature(Catalogue_Build& build, Feature feature, const Function_View* function) {
   const Feature_Row& row = kFeatures[static_cast<size_t>(feature)];

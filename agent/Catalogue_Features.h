@@ -66,6 +66,10 @@ enum class Feature : uint8_t {
 // a per-port feature, null otherwise.
 using Feature_Builder = int (*)(Catalogue_Build& build, const Function_View* function);
 
+// Installs the builder of a feature (null: none).  Features register at
+// module load, before any build runs; the table is not guarded.
+void set_feature_builder(Feature feature, Feature_Builder builder);
+
 enum class Feature_Result : uint8_t { kMade, kNotBuilt, kFailed };
 
 // Runs the feature's builder and logs its success text, or its failure text

@@ -65,8 +65,10 @@ void own_copied_property(Instance* copy, const Meta_Property* mp) {
   visit_type(mp->type, [&](auto tag) {
     using T = typename decltype(tag)::type;
     if (is_array(mp)) {
-      const Array<T>& shared = *static_cast<const Array<T>*>(where);
-      new (where) Array<T>(shared.deep_copy());
+      // Copied into a local first: constructing straight into `where` would
+      // let the copy's construction overwrite the handle it copies from.
+      Array<T> own = static_cast<const Array<T>*>(where)->deep_copy();
+      new (where) Array<T>(std::move(own));
     } else if constexpr (!std::is_trivially_copyable_v<T>) {
       const T& shared = *static_cast<const T*>(where);
       new (where) T(shared);

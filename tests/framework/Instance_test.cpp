@@ -133,6 +133,9 @@ TEST(Clone, ChangingACloneNeverChangesTheOriginal) {
   copy->ElementName.value.append("-changed");
   copy->Tag.set_null();
   EXPECT_EQ(chip->OperationalStatus.value.size(), 1u);
+  // The clone keeps the original's elements before its own.
+  ASSERT_EQ(copy->OperationalStatus.value.size(), 2u);
+  EXPECT_EQ(copy->OperationalStatus.value[0], 2);
   EXPECT_EQ(chip->ElementName.value, "name");
   EXPECT_FALSE(chip->Tag.is_null());
   drop(chip);
