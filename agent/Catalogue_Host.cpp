@@ -24,10 +24,11 @@ struct Up_Call_Texts {
   const char* found;
 };
 
-// The first instance the platform answers for `model` whose class is
-// `wanted` or derived from it, as a copy in the platform's name space.
-Instance* platform_instance(const Instance* model, const Meta_Class* wanted, const Up_Call_Texts& texts) {
+// The first instance the platform answers for its class `model_class` whose
+// class is `wanted` or derived from it, as a copy in the platform's name space.
+Instance* platform_instance(const Meta_Class* model_class, const Meta_Class* wanted, const Up_Call_Texts& texts) {
   NRV_LOG(NRV_DBG, "%s", texts.started);
+  Instance* model = create(model_class, true);
   NRV_LOG(NRV_DBG, "%s", texts.calling);
   Instance* found = nullptr;
   if (std::unique_ptr<Instance_Cursor> cursor = cimom::enum_instances(kPlatformNameSpace, model)) {
@@ -41,6 +42,7 @@ Instance* platform_instance(const Instance* model, const Meta_Class* wanted, con
       }
     }
   }
+  destroy(model);
   return found;
 }
 
@@ -101,12 +103,10 @@ Host_Identity resolve_host_identity() {
 
 bool build_host_system(Catalogue_Build& build) {
   ProviderAgent& agent = build.agent;
-  KVLD_ComputerSystem* model = KVLD_ComputerSystem::create(true);
-  Instance* cs = platform_instance(model, &CIM_ComputerSystem::static_meta_class,
+  Instance* cs = platform_instance(&KVLD_ComputerSystem::static_meta_class, &CIM_ComputerSystem::static_meta_class,
                                    {"up-call to enumerate CIM_ComputerSystem started",
                                     "up-call to enumerate CIM_ComputerSystem created--calling now",
                                     "up-call - found the correct CIM_ComputerSystem to link"});
-  destroy(model);
   NRV_LOG(NRV_INFO, "up-call to enumerate CIM_ComputerSystem created");
   if (cs == nullptr) {
     NRV_LOG(NRV_DBG, "up-call method failed");
@@ -118,12 +118,10 @@ bool build_host_system(Catalogue_Build& build) {
 }
 
 bool chassis_up_call(Catalogue_Build& build) {
-  KVLD_Chassis* model = KVLD_Chassis::create(true);
-  Instance* chassis = platform_instance(model, &CIM_Chassis::static_meta_class,
+  Instance* chassis = platform_instance(&KVLD_Chassis::static_meta_class, &CIM_Chassis::static_meta_class,
                                         {"up-call to enumerate CIM_Chassis started",
                                          "up-call to enumerate CIM_Chassis created--calling now",
                                          "up-call - found the correct CIM_Chassis to link"});
-  destroy(model);
   if (chassis == nullptr) return false;
   build.chassis = insert_into(build.agent.m_CIM_Chassis_map, chassis, "Insert Failed : m_CIM_Chassis_map");
   return build.chassis != nullptr;

@@ -137,9 +137,22 @@ bool create_wwn_service(Catalogue_Build& build) {
   return true;
 }
 
+// A service hosted by the host system, for the services that log their
+// own creation failures.
+template <class S, class Hosted>
+static Instance* hosted_service(Catalogue_Build& build, const char* name, const char* description, const char* status) {
+  Instance* service = insert_instance(build.agent, make_service<S>(build, name, description, status));
+  if (service == nullptr) {
+    NRV_LOG(NRV_ERR, "Failed to create %s", S::static_meta_class.name);
+    return nullptr;
+  }
+  if (associate<Hosted>(build, std::string("Hosted ") + description, build.host, service) == nullptr)
+    NRV_LOG(NRV_ERR, "Failed to create %s", Hosted::static_meta_class.name);
+  return service;
+}
+
 bool create_ip_configuration_service(Catalogue_Build& build) {
-  ProviderAgent& agent = build.agent;
-  Instance_Map& map = agent.m_NRVTAVO_IPConfigurationService_map;
+  Instance_Map& map = build.agent.m_NRVTAVO_IPConfigurationService_map;
   for (size_t i = 0; i < map.size(); ++i) {
     if (static_cast<NRVTAVO_IPConfigurationService*>(map[i])->Name.value == "NRVTAVO_IPConfigurationService") {
       NRV_LOG(NRV_DBG, "Got NRVTAVO_IPConfigurationService in the map");
@@ -147,37 +160,16 @@ bool create_ip_configuration_service(Catalogue_Build& build) {
       return true;
     }
   }
-  auto* service = insert_instance(
-      agent,
-      make_service<NRVTAVO_IPConfigurationService>(build, "NRVTAVO_IPConfigurationService",
-                                                   "Norvane IP Configuration Service", "ok"),
-      "Insert Failed : m_NRVTAVO_IPConfigurationService_map");
-  if (service == nullptr) {
-    NRV_LOG(NRV_ERR, "Failed to create NRVTAVO_IPConfigurationService");
-    return false;
-  }
-  build.ip_service = service;
-  if (associate<NRVTAVO_HostedIPConfigurationService>(build, "Hosted IP Configuration Service", build.host,
-                                                      service) == nullptr)
-    NRV_LOG(NRV_ERR, "Failed to create NRVTAVO_HostedIPConfigurationService");
-  return true;
+  build.ip_service = hosted_service<NRVTAVO_IPConfigurationService, NRVTAVO_HostedIPConfigurationService>(
+      build, "NRVTAVO_IPConfigurationService", "Norvane IP Configuration Service", "ok");
+  return build.ip_service != nullptr;
 }
 
 bool create_driver_parameter_service(Catalogue_Build& build) {
-  auto* service = insert_instance(
-      build.agent,
-      make_service<NRVTAVO_DriverParameterService>(build, "NRVTAVO_DriverParameterService",
-                                                   "Norvane FCoE TAVO Set Driver Parameters Service", "OK"),
-      "Insert Failed : m_NRVTAVO_DriverParameterService_map");
-  if (service == nullptr) {
-    NRV_LOG(NRV_ERR, "Failed to create NRVTAVO_DriverParameterService");
-    return false;
-  }
-  build.driver_parameter_service = service;
-  if (associate<NRVTAVO_HostedDriverParameterService>(build, "Hosted Driver Parameter Service", build.host,
-                                                      service) == nullptr)
-    NRV_LOG(NRV_ERR, "Failed to create NRVTAVO_HostedDriverParameterService");
-  return true;
+  build.driver_parameter_service =
+      hosted_service<NRVTAVO_DriverParameterService, NRVTAVO_HostedDriverParameterService>(
+          build, "NRVTAVO_DriverParameterService", "Norvane FCoE TAVO Set Driver Parameters Service", "OK");
+  return build.driver_parameter_service != nullptr;
 }
 
 void create_weblaunch_access_point(Catalogue_Build& build) {

@@ -2,21 +2,16 @@
 // the SAN (buildAdapterData + buildSANData) over sites of 1x, 10x and 100x the
 // sample's FC targets and LUNs, with the peak resident memory of each run.
 //
-// The simulator reads its site once per process, so each size runs in a
-// child process of its own: the parent re-executes this program with
-// NRV_SITE naming the size's site and NRV_DATA_BENCH_SCALE the size.
+// Each size runs in a child process of its own (Bench_Scales.h).
 #include <benchmark/benchmark.h>
 
-#include <stdlib.h>
 #include <sys/resource.h>
-#include <sys/wait.h>
-#include <unistd.h>
 
 #include <chrono>
 #include <string>
-#include <vector>
 
 #include "access/NRV_Runtime_Loader.h"
+#include "bench/Bench_Scales.h"
 #include "data/NRV_Data.h"
 
 namespace {
@@ -51,43 +46,17 @@ void BM_BuildAdapterAndSANData(benchmark::State& state) {
   state.counters["peak_rss_MiB"] = static_cast<double>(usage.ru_maxrss) / 1024.0;
 }
 
-int runChild(const char* self, const std::string& scale, int argc, char** argv) {
-  const pid_t pid = fork();
-  if (pid < 0) return -1;
-  if (pid == 0) {
-    const std::string site = std::string(NRV_DATA_BENCH_SITE_DIR) + "/site_x" + scale + ".json";
-    setenv("NRV_SITE", site.c_str(), 1);
-    setenv("NRV_DATA_BENCH_SCALE", scale.c_str(), 1);
-    std::vector<char*> args(argv, argv + argc);
-    args.push_back(nullptr);
-    execv(self, args.data());
-    _exit(127);
-  }
-  int status = 0;
-  waitpid(pid, &status, 0);
-  return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-}
-
 }  // namespace
 
-int main(int argc, char** argv) {
-  const char* scale = getenv("NRV_DATA_BENCH_SCALE");
-  if (scale == nullptr) {
-    char self[4096];
-    const ssize_t n = readlink("/proc/self/exe", self, sizeof self - 1);
-    if (n <= 0) return 1;
-    self[n] = '\0';
-    int failures = 0;
-    for (const char* s : {"1", "10", "100"}) failures += runChild(self, s, argc, argv) != 0;
-    return failures == 0 ? 0 : 1;
-  }
-  if (cimple::NRV_Runtime_Loader::loadLibraries() != 0) return 1;
-  benchmark::RegisterBenchmark((std::string("BM_BuildAdapterAndSANData/x") + scale).c_str(),
-                               BM_BuildAdapterAndSANData)
+bool run(const std::string& scale) {
+  if (cimple::NRV_Runtime_Loader::loadLibraries() != 0) return false;
+  benchmark::RegisterBenchmark(("BM_BuildAdapterAndSANData/x" + scale).c_str(), BM_BuildAdapterAndSANData)
       ->Unit(benchmark::kMillisecond);
-  benchmark::Initialize(&argc, argv);
-  benchmark::RunSpecifiedBenchmarks();
-  benchmark::Shutdown();
+  return true;
+}
+
+int main(int argc, char** argv) {
+  const int status = nrv_bench::run_scales(argc, argv, NRV_DATA_BENCH_SITE_DIR, run);
   cimple::NRV_Runtime_Loader::unloadLibraries();
-  return 0;
+  return status;
 }

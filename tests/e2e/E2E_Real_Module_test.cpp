@@ -1,5 +1,5 @@
 // The real module in the host: it loads, every provider's factories resolve
-// and make MIs, and a catalogue-backed class answers an empty success
+// and make MIs, and a catalogue-backed class answers the site's instances
 // through the nrv-cim client.
 #include <cstdlib>
 #include <set>
@@ -49,10 +49,11 @@ TEST(RealModule, EveryProviderMakesItsMisAndCleansUp) {
   for (const CleanupRecord& record : host.cleanupRecords()) EXPECT_EQ(record.rc, CMPI_RC_OK) << record.factory;
 }
 
-TEST(RealModule, ChipEnumerationThroughTheClientAnswersAnEmptySuccess) {
-  auto run = nrv::host::test::runClient({"-m", real_module(), "ei", "root/norvane:NRVTAVO_Chip"});
+TEST(RealModule, ChipEnumerationThroughTheClientAnswersTheSampleSitesChips) {
+  auto run = nrv::host::test::runClient({"-m", real_module(), "ein", "root/norvane:NRVTAVO_Chip"});
   EXPECT_EQ(run.status, 0) << run.err;
-  EXPECT_EQ(run.out.find("instance of"), std::string::npos) << run.out;
+  EXPECT_NE(run.out.find("NRVTAVO_Chip.Tag=\"NV52C4213A07719\""), std::string::npos) << run.out;
+  EXPECT_NE(run.out.find("NRVTAVO_Chip.Tag=\"NV41T5120A03342\""), std::string::npos) << run.out;
   EXPECT_EQ(run.err.find("CMPI_RC_ERR"), std::string::npos) << run.err;
 }
 
