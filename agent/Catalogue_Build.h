@@ -23,8 +23,6 @@
 
 namespace cimple {
 
-class Adapter;
-class Port;
 
 // The instances of one physical card (one serial number).
 struct Card_Entry {
@@ -68,7 +66,6 @@ struct Catalogue_Build {
   std::unordered_map<std::string, Card_Entry> cards;                  // by serial number
   std::unordered_map<std::string, Chip_Entry> chips;                  // by chip tag
   std::unordered_map<std::string, Physical_Port_Entry> physical_ports;  // by "serial:port"
-  std::unordered_map<std::string, Instance*> ethernet_ports;          // by DeviceID
 
   // A key-only copy of `end` (keys and name space), made once per instance
   // and shared by every association that refers to it.  Null for null.

@@ -103,7 +103,6 @@ Instance* create_ethernet_port(Catalogue_Build& build, const Function_View& fn, 
   Instance* inserted =
       insert_instance(build.agent, port, iscsi ? "Insert Failed iSCSI : m_NRVTAVO_EthernetPort_map" : nullptr);
   if (inserted == nullptr) return nullptr;
-  build.ethernet_ports.emplace(id, inserted);
   if (!iscsi && physical.ethernet_port == nullptr) physical.ethernet_port = inserted;
   associate<NRVTAVO_EthernetPortSystemDevice>(build, id, build.host, inserted);
   associate<NRVTAVO_Realizes>(build, id, physical.connector, inserted);
