@@ -3,7 +3,7 @@
 #include <dlfcn.h>
 
 #include "access/NRV_Common.h"
-#include "access/NRV_SystemPaths.h"
+#include "logging/NRV_SystemPaths.h"
 #include "agent/Association_Builder.h"
 #include "agent/Catalogue_Profiles.h"
 #include "agent/ProviderAgent.h"

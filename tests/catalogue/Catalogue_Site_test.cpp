@@ -122,7 +122,6 @@ const std::map<std::string, size_t> kSampleCounts = {
     {"NRVTAVO_DeviceSAPImplementation", 2},
 };
 
-PathData class_path(const std::string& name) { return {kNs, "", name, {}}; }
 
 std::string text(const Datum* d) { return d && d->type == CMPI_string ? d->text : std::string(); }
 const PathData& ref(const Datum* d) { return *d->path; }
