@@ -35,7 +35,7 @@ inline constexpr Catalogue catalogue_of = Catalogue::Adapter;
 #define NRV_CATALOGUE_SAN_CLASS(C) \
   template <>                      \
   inline constexpr Catalogue catalogue_of<C> = Catalogue::SAN;
-NRV_SAN_CATALOGUE_CLASSES(NRV_CATALOGUE_SAN_CLASS)
+NRV_FOR_EACH_SAN_CATALOGUE_CLASS(NRV_CATALOGUE_SAN_CLASS)
 #undef NRV_CATALOGUE_SAN_CLASS
 
 }  // namespace cimple

@@ -1,8 +1,8 @@
 // The module unit: every class of the generated provider lists, served by the
-// provider Provider_For<C> names (catalogue-backed unless a service provider
-// claims the class).
+// provider Provider_For<C> names (the catalogue template, or the class's own
+// hand-written provider).
 #include "framework/Module_Entry.h"
-#include "module/Service_Providers.h"
+#include "module/Provider_For.h"
 #include "schema/Classes.h"
 #include "schema/ProviderClasses.h"
 

@@ -1,15 +1,6 @@
-// Every provider that is not catalogue-backed claims its class here by
-// specialising Provider_For<C>.
+// The header of every hand-written provider the module has built: each
+// declares <Class>_Provider for a class of the hand-written list.  Included
+// by module/Provider_For.h, which binds the classes to them.
 #pragma once
 
 #include "agent/NRVTAVO_ProviderConfigSetting_Provider.h"
-#include "module/Provider_For.h"
-
-namespace cimple {
-
-template <>
-struct Provider_For<NRVTAVO_ProviderConfigSetting> {
-  using type = NRVTAVO_ProviderConfigSetting_Provider;
-};
-
-}  // namespace cimple

@@ -1,6 +1,8 @@
 // When the agent fetches and what a fetch rebuilds: the first read, the
 // cache timeout measured from the end of the last fetch, SAN requests, the
 // refresh settings, the clearing groups and the driver-log readers.
+#include <set>
+#include <string>
 #include <thread>
 
 #include "AgentFixture.h"
@@ -161,31 +163,28 @@ TEST_F(FetchTest, AReadDuringAFetchJoinsItInsteadOfStartingAnother) {
   EXPECT_EQ(fake.adapterDataBuilds, 1);
 }
 
+// Every map but the survivors is emptied, whichever group the lists put it in.
 TEST_F(FetchTest, ClearingEmptiesTheGroupsAndKeepsTheSurvivors) {
   ProviderAgent& agent = start();
+  std::set<std::string> survivors;
+#define NRV_TEST_SURVIVOR(C) survivors.insert(#C);
+  NRV_SURVIVOR_MAPS(NRV_TEST_SURVIVOR)
+#undef NRV_TEST_SURVIVOR
   {
     std::lock_guard<std::recursive_mutex> data(agent.m_DataMutex);
-    auto put = [](Instance_Map& map, const char* id) {
-      Instance* i = create(map.meta_class(), false);
-      if (const Meta_Property* mp = find_property(i->meta_class, "InstanceID"))
-        static_cast<Property<String>*>(slot(i, mp->offset))->set(id);
-      ASSERT_GE(map.insert(i), 0);
-    };
-    put(agent.m_CIM_ComputerSystem_map, "cs");
-    put(agent.m_NRVTAVO_RegisteredProfile_map, "p");
-    put(agent.m_NRVTAVO_FCWWNService_map, "w");
-    put(agent.m_NRVTAVO_LogicalDisk_map, "d");
-    put(agent.m_NRVTAVO_ConcreteJob_map, "job");
-    put(agent.m_NRVTAVO_iSCSISettingService_map, "iss");
+#define NRV_TEST_FILL(C) ASSERT_GE(agent_map<C>(agent).insert(create(&C::static_meta_class, false)), 0) << #C;
+    NRV_FOR_EACH_PROVIDER_CLASS(NRV_TEST_FILL)
+    NRV_HOST_MAPS(NRV_TEST_FILL)
+#undef NRV_TEST_FILL
   }
   capture.reset();
   agent.ClearMaps();
-  EXPECT_TRUE(agent.m_CIM_ComputerSystem_map.empty());
-  EXPECT_TRUE(agent.m_NRVTAVO_RegisteredProfile_map.empty());
-  EXPECT_TRUE(agent.m_NRVTAVO_FCWWNService_map.empty());
-  EXPECT_TRUE(agent.m_NRVTAVO_LogicalDisk_map.empty());
-  EXPECT_EQ(agent.m_NRVTAVO_ConcreteJob_map.size(), 1u);
-  EXPECT_EQ(agent.m_NRVTAVO_iSCSISettingService_map.size(), 1u);
+#define NRV_TEST_CLEARED(C) EXPECT_EQ(agent_map<C>(agent).size(), survivors.count(#C)) << #C;
+  NRV_FOR_EACH_PROVIDER_CLASS(NRV_TEST_CLEARED)
+  NRV_HOST_MAPS(NRV_TEST_CLEARED)
+#undef NRV_TEST_CLEARED
+  EXPECT_TRUE(survivors.count("NRVTAVO_ConcreteJob"));
+  EXPECT_TRUE(survivors.count("NRVTAVO_iSCSISettingService"));
 
   long at = 0;
   for (const char* text :

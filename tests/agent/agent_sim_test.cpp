@@ -10,7 +10,7 @@
 #include "agent/Catalogue_Provider.h"
 #include "logging/Log.h"
 #include "logging/NRV_LogDataFile.h"
-#include "module/Service_Providers.h"
+#include "module/Provider_For.h"
 #include "schema/Classes.h"
 
 namespace nrv_test {

@@ -5,7 +5,7 @@
 
 #include "AgentFixture.h"
 #include "logging/Log.h"
-#include "module/Service_Providers.h"
+#include "module/Provider_For.h"
 #include "schema/Classes.h"
 
 namespace nrv_test {

@@ -12,6 +12,7 @@ sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."
 import gen_meta  # noqa: E402
 import mof  # noqa: E402
 from meta_model import Schema, SchemaError  # noqa: E402
+from provider_lists import ListsError, ProviderLists  # noqa: E402
 
 BASE = """
 [Abstract] class T_Root { [Key] string Id; uint64 Gen; };
@@ -147,6 +148,80 @@ class Output(unittest.TestCase):
             self.assertIn("NRVTAVO_All* Left;", header)
             self.assertIn("NRVTAVO_Root* Right;", header)
             self.assertIn("Property<uint16> Weight;", header)
+
+
+LISTS_SCHEMA = """
+class P_Host { [Key] string Id; };
+class NRVTAVO_A { [Key] string Id; };
+class NRVTAVO_S { [Key] string Id; };
+class NRVTAVO_H { [Key] string Id; };
+class NRVTAVO_R { [Key] string Id; };
+"""
+LISTS = """# a valid set
+[adapter catalogue]
+NRVTAVO_A
+[SAN catalogue]
+NRVTAVO_S
+[hand-written]
+NRVTAVO_H
+NRVTAVO_R
+[refresh]
+NRVTAVO_R
+[not yet built]
+NRVTAVO_R   # served by the template meanwhile
+[clearAdapterMaps HOST]
+P_Host
+[clearAdapterMaps MAIN]
+NRVTAVO_A
+NRVTAVO_R
+[clearSANMaps SAN]
+NRVTAVO_S
+[survivors]
+NRVTAVO_H
+"""
+
+
+class Lists(unittest.TestCase):
+    def lists(self, text):
+        with tempfile.TemporaryDirectory() as d:
+            path = os.path.join(d, "lists.txt")
+            with open(path, "w") as f:
+                f.write(text)
+            return ProviderLists(path, schema(LISTS_SCHEMA), "NRVTAVO_")
+
+    def test_valid_lists_give_the_sets_and_groups_in_order(self):
+        lists = self.lists(LISTS)
+        self.assertEqual(lists.own_providers(), ["NRVTAVO_H"])
+        self.assertEqual([(fn, g) for fn, g, _ in lists.groups],
+                         [("clearAdapterMaps", "HOST"), ("clearAdapterMaps", "MAIN"), ("clearSANMaps", "SAN")])
+
+    CASES = [  # (edits of the valid lists, expected error)
+        ([("[adapter catalogue]\nNRVTAVO_A", "[adapter catalogue]")], "NRVTAVO_A is in none of"),
+        ([("[SAN catalogue]\nNRVTAVO_S", "[SAN catalogue]\nNRVTAVO_S\nNRVTAVO_A")],
+         "is in [adapter catalogue] and in [SAN catalogue]; a class has one provider"),
+        ([("NRVTAVO_R\n[refresh]", "NRVTAVO_R\nP_Host\n[refresh]")], "P_Host in [hand-written] is not a provider"),
+        ([("[refresh]\nNRVTAVO_R", "[refresh]\nNRVTAVO_A")], "NRVTAVO_A in [refresh] is not hand-written"),
+        ([("[survivors]\nNRVTAVO_H", "[survivors]")], "map of NRVTAVO_H is in no clearing group"),
+        ([("[survivors]\nNRVTAVO_H", "[survivors]\nNRVTAVO_H\nNRVTAVO_A")],
+         "NRVTAVO_A is in [clearAdapterMaps MAIN] and in [survivors]; a map is emptied by one group"),
+        ([("[clearAdapterMaps MAIN]\nNRVTAVO_A", "[clearAdapterMaps MAIN]"),
+          ("[clearSANMaps SAN]\nNRVTAVO_S", "[clearSANMaps SAN]\nNRVTAVO_S\nNRVTAVO_A")],
+         "the SAN catalogue and the maps clearSANMaps empties differ in NRVTAVO_A"),
+        ([("[survivors]", "[survivor]")], "unknown section [survivor]"),
+        ([("NRVTAVO_R   #", "NRVTAVO_Q   #")], ":12: NRVTAVO_Q is not a class of the schema"),
+        ([("[survivors]", "[refresh]")], "section [refresh] given twice"),
+    ]
+
+    def test_each_broken_rule_is_named(self):
+        for edits, message in self.CASES:
+            with self.subTest(message=message):
+                text = LISTS
+                for old, new in edits:
+                    self.assertIn(old, text)
+                    text = text.replace(old, new, 1)
+                with self.assertRaises(ListsError) as caught:
+                    self.lists(text)
+                self.assertIn(message, str(caught.exception))
 
 
 if __name__ == "__main__":
