@@ -160,7 +160,7 @@ Instance* create_driver_identity(Catalogue_Build& build, const Function_View& fn
   identity->Classifications.set({2});
   identity->ClassificationDescriptions.set({row.classification});
   if (row.type_label) {
-    HBA_UINT32 type = fn.a.integer(kAttrDriverType);
+    HBA_UINT32 type = fn.a.integer(NRV_ATTR_DRIVER_TYPE);
     if (kind == Driver_Kind::kNic) {
       type = 0;
       if (RM_GetDriverType(fn.adapter.getIdentifier(), &type) != 0) type = 0;

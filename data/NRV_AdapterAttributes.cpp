@@ -13,59 +13,60 @@ namespace {
 enum KindBit : unsigned { kNic = 1, kIscsi = 2, kFcoe = 4 };
 using Kind = AdapterAttributes::Kind;
 
-// Every member of the adapter sets: number, type, kinds that read it, label,
-// and the NIC and FCoE labels where those differ.  Read in this order.
-#define NRV_ADAPTER_FIELDS(X)                                                         \
-  X(514, kText, kNic | kIscsi | kFcoe, "_Manufacturer", nullptr, "_MANUFACTURER")     \
-  X(515, kText, kNic | kIscsi | kFcoe, "_SerialNumber", nullptr, nullptr)             \
-  X(516, kText, kNic | kIscsi | kFcoe, "_Model", nullptr, nullptr)                    \
-  X(517, kText, kNic | kIscsi | kFcoe, "_ModelDescription", nullptr, nullptr)         \
-  X(519, kText, kFcoe, "_NodeSymbolicName", nullptr, nullptr)                         \
-  /* the iSCSI set reads 528 before the hardware version as well */                   \
-  X(528, kText, kIscsi, "_OpertionalFirmwareVersion", nullptr, nullptr)               \
-  X(520, kText, kNic | kIscsi | kFcoe, "_HardwareVersion", "_HWVersion", nullptr)     \
-  X(521, kText, kNic | kIscsi | kFcoe, "_OptionROMVersion", nullptr, nullptr)         \
-  X(522, kText, kNic | kIscsi | kFcoe, "_FirmwareVersion", nullptr, nullptr)          \
-  X(523, kInteger, kNic | kFcoe, "_VendorSpecificID", nullptr, nullptr)               \
-  X(525, kText, kNic | kIscsi | kFcoe, "_DriverName", nullptr, nullptr)               \
-  X(526, kInteger, kNic | kIscsi | kFcoe, "_DeviceID", nullptr, nullptr)              \
-  X(527, kInteger, kNic | kIscsi | kFcoe, "_ModelID", nullptr, nullptr)               \
-  X(528, kText, kNic | kIscsi | kFcoe, "_OpertionalFirmwareVersion", nullptr, nullptr) \
-  X(531, kMac, kFcoe, "_IEEEAddress", nullptr, nullptr)                               \
-  X(532, kInteger, kNic, "_BootCodeEnabled", nullptr, nullptr)                        \
-  X(533, kText, kNic | kIscsi | kFcoe, "_DriverVersion", nullptr, nullptr)            \
-  X(534, kText, kNic | kIscsi | kFcoe, "_BootImageExpansionROMVersion", "_BootVersion", nullptr) \
-  X(544, kInteger, kNic, "_DiagVersionNumber", nullptr, nullptr)                      \
-  X(545, kText, kFcoe, "_FunctionalFirmwareVersion", nullptr, nullptr)                \
-  X(546, kText, kFcoe, "_KernelFirmwareVersion", nullptr, nullptr)                    \
-  X(549, kInteger, kFcoe, "_SLIMode", nullptr, nullptr)                               \
-  X(551, kInteger, kNic | kFcoe, "_BoardTemperature", nullptr, nullptr)               \
-  X(555, kInteger, kNic | kIscsi | kFcoe, "_PCIBusNumber", nullptr, nullptr)          \
-  X(556, kInteger, kNic, "_FunctionType", nullptr, nullptr)                           \
-  X(557, kInteger, kNic, "_SubDeviceID", nullptr, nullptr)                            \
-  X(559, kInteger, kNic | kIscsi | kFcoe, "_PortNumber", nullptr, nullptr)            \
-  X(560, kInteger, kNic | kIscsi | kFcoe, "_PCIFunctionNumber", nullptr, nullptr)     \
-  X(561, kInteger, kNic, "_SubVendorID", nullptr, nullptr)                            \
-  X(562, kInteger, kNic | kIscsi | kFcoe, "_FirmwareStatus", nullptr, nullptr)        \
-  X(563, kText, kFcoe, "_SPFirmwareVersion", nullptr, nullptr)                        \
-  X(564, kText, kFcoe, "_SPFirmwareName", nullptr, nullptr)                           \
-  X(565, kText, kFcoe, "_ULPFirmwareVersion", nullptr, nullptr)                       \
-  X(566, kText, kFcoe, "_ULPFirmwareName", nullptr, nullptr)                          \
-  X(572, kText, kNic, "_IPLFilename", nullptr, nullptr)                               \
-  X(573, kText, kNic, "_NCSIVersion", nullptr, nullptr)                               \
-  X(574, kText, kNic, "_FCOEUniversalVersion", nullptr, nullptr)                      \
-  X(575, kText, kNic, "_FCOE_X86_BIOSVersion", nullptr, nullptr)                      \
-  X(576, kText, kNic, "_FCOE_EFIVersion", nullptr, nullptr)                           \
-  X(577, kText, kNic, "_FCOE_FCODEVersion", nullptr, nullptr)                         \
-  X(578, kText, kNic, "_UEFI_BIOSVersion", nullptr, nullptr)                          \
-  X(579, kText, kNic, "_UEFI_NICVersion", nullptr, nullptr)                           \
-  X(580, kText, kNic, "_UEFI_FCODEVersion", nullptr, nullptr)                         \
-  X(581, kText, kNic, "_UEFI_ISCSIVersion", nullptr, nullptr)                         \
-  X(582, kText, kNic, "_PCIBusSpeed", nullptr, nullptr)                               \
-  X(583, kText, kNic, "_PCIBusWidth", nullptr, nullptr)                               \
-  X(585, kInteger, kNic, "_PortConnectionType", nullptr, nullptr)                     \
-  X(586, kText, kNic | kIscsi | kFcoe, "_Subadapter_number", nullptr, nullptr)        \
-  X(591, kText, kNic, "_FirmwareOnFlash", nullptr, nullptr)
+// Every member of the adapter sets: attribute number, type, kinds that read
+// it, label, and the NIC and FCoE labels where those differ (labels only name
+// the member in the log).  Read in this order.
+#define NRV_ADAPTER_FIELDS(X)                                                                                         \
+  X(RM_HA_MANUFACTURER, kText, kNic | kIscsi | kFcoe, "_Manufacturer", nullptr, "_MANUFACTURER")                      \
+  X(RM_HA_SERIAL_NUMBER, kText, kNic | kIscsi | kFcoe, "_SerialNumber", nullptr, nullptr)                             \
+  X(RM_HA_MODEL, kText, kNic | kIscsi | kFcoe, "_Model", nullptr, nullptr)                                            \
+  X(RM_HA_MODEL_DESCRIPTION, kText, kNic | kIscsi | kFcoe, "_ModelDescription", nullptr, nullptr)                     \
+  X(RM_HA_NODE_SYMBOLIC_NAME, kText, kFcoe, "_NodeSymbolicName", nullptr, nullptr)                                    \
+  /* the iSCSI set reads the operational version before the hardware version too */                                   \
+  X(RM_HA_OPERATIONAL_FIRMWARE_VERSION, kText, kIscsi, "_OpertionalFirmwareVersion", nullptr, nullptr)                \
+  X(RM_HA_HARDWARE_VERSION, kText, kNic | kIscsi | kFcoe, "_HardwareVersion", "_HWVersion", nullptr)                  \
+  X(RM_HA_OPTION_ROM_VERSION, kText, kNic | kIscsi | kFcoe, "_OptionROMVersion", nullptr, nullptr)                    \
+  X(RM_HA_FIRMWARE_VERSION, kText, kNic | kIscsi | kFcoe, "_FirmwareVersion", nullptr, nullptr)                       \
+  X(RM_HA_VENDOR_SPECIFIC_ID, kInteger, kNic | kFcoe, "_VendorSpecificID", nullptr, nullptr)                          \
+  X(RM_HA_DRIVER_NAME, kText, kNic | kIscsi | kFcoe, "_DriverName", nullptr, nullptr)                                 \
+  X(RM_HA_DEVICE_ID, kInteger, kNic | kIscsi | kFcoe, "_DeviceID", nullptr, nullptr)                                  \
+  X(RM_HA_MODEL_ID, kInteger, kNic | kIscsi | kFcoe, "_ModelID", nullptr, nullptr)                                    \
+  X(RM_HA_OPERATIONAL_FIRMWARE_VERSION, kText, kNic | kIscsi | kFcoe, "_OpertionalFirmwareVersion", nullptr, nullptr) \
+  X(RM_HA_IEEE_ADDRESS, kMac, kFcoe, "_IEEEAddress", nullptr, nullptr)                                                \
+  X(RM_HA_BOOT_CODE_ENABLED, kInteger, kNic, "_BootCodeEnabled", nullptr, nullptr)                                    \
+  X(RM_HA_DRIVER_VERSION, kText, kNic | kIscsi | kFcoe, "_DriverVersion", nullptr, nullptr)                           \
+  X(RM_HA_BOOT_IMAGE_VERSION, kText, kNic | kIscsi | kFcoe, "_BootImageExpansionROMVersion", "_BootVersion", nullptr) \
+  X(RM_HA_DIAG_VERSION_NUMBER, kInteger, kNic, "_DiagVersionNumber", nullptr, nullptr)                                \
+  X(RM_HA_FUNCTIONAL_FIRMWARE_VERSION, kText, kFcoe, "_FunctionalFirmwareVersion", nullptr, nullptr)                  \
+  X(RM_HA_KERNEL_FIRMWARE_VERSION, kText, kFcoe, "_KernelFirmwareVersion", nullptr, nullptr)                          \
+  X(RM_HA_SLI_MODE, kInteger, kFcoe, "_SLIMode", nullptr, nullptr)                                                    \
+  X(RM_HA_BOARD_TEMPERATURE, kInteger, kNic | kFcoe, "_BoardTemperature", nullptr, nullptr)                           \
+  X(RM_HA_PCI_BUS_NUMBER, kInteger, kNic | kIscsi | kFcoe, "_PCIBusNumber", nullptr, nullptr)                         \
+  X(RM_HA_FUNCTION_TYPE, kInteger, kNic, "_FunctionType", nullptr, nullptr)                                           \
+  X(RM_HA_SUB_DEVICE_ID, kInteger, kNic, "_SubDeviceID", nullptr, nullptr)                                            \
+  X(RM_HA_PORT_NUMBER, kInteger, kNic | kIscsi | kFcoe, "_PortNumber", nullptr, nullptr)                              \
+  X(RM_HA_PCI_FUNCTION_NUMBER, kInteger, kNic | kIscsi | kFcoe, "_PCIFunctionNumber", nullptr, nullptr)               \
+  X(RM_HA_SUB_VENDOR_ID, kInteger, kNic, "_SubVendorID", nullptr, nullptr)                                            \
+  X(RM_HA_FIRMWARE_STATUS, kInteger, kNic | kIscsi | kFcoe, "_FirmwareStatus", nullptr, nullptr)                      \
+  X(RM_HA_SP_FIRMWARE_VERSION, kText, kFcoe, "_SPFirmwareVersion", nullptr, nullptr)                                  \
+  X(RM_HA_SP_FIRMWARE_NAME, kText, kFcoe, "_SPFirmwareName", nullptr, nullptr)                                        \
+  X(RM_HA_ULP_FIRMWARE_VERSION, kText, kFcoe, "_ULPFirmwareVersion", nullptr, nullptr)                                \
+  X(RM_HA_ULP_FIRMWARE_NAME, kText, kFcoe, "_ULPFirmwareName", nullptr, nullptr)                                      \
+  X(RM_HA_IPL_FILENAME, kText, kNic, "_IPLFilename", nullptr, nullptr)                                                \
+  X(RM_HA_NCSI_VERSION, kText, kNic, "_NCSIVersion", nullptr, nullptr)                                                \
+  X(RM_HA_FCOE_UNIVERSAL_VERSION, kText, kNic, "_FCOEUniversalVersion", nullptr, nullptr)                             \
+  X(RM_HA_FCOE_X86_BIOS_VERSION, kText, kNic, "_FCOE_X86_BIOSVersion", nullptr, nullptr)                              \
+  X(RM_HA_FCOE_EFI_VERSION, kText, kNic, "_FCOE_EFIVersion", nullptr, nullptr)                                        \
+  X(RM_HA_FCOE_FCODE_VERSION, kText, kNic, "_FCOE_FCODEVersion", nullptr, nullptr)                                    \
+  X(RM_HA_UEFI_BIOS_VERSION, kText, kNic, "_UEFI_BIOSVersion", nullptr, nullptr)                                      \
+  X(RM_HA_UEFI_NIC_VERSION, kText, kNic, "_UEFI_NICVersion", nullptr, nullptr)                                        \
+  X(RM_HA_UEFI_FCODE_VERSION, kText, kNic, "_UEFI_FCODEVersion", nullptr, nullptr)                                    \
+  X(RM_HA_UEFI_ISCSI_VERSION, kText, kNic, "_UEFI_ISCSIVersion", nullptr, nullptr)                                    \
+  X(RM_HA_PCI_BUS_SPEED, kText, kNic, "_PCIBusSpeed", nullptr, nullptr)                                               \
+  X(RM_HA_PCI_BUS_WIDTH, kText, kNic, "_PCIBusWidth", nullptr, nullptr)                                               \
+  X(RM_HA_PORT_CONNECTION_TYPE, kInteger, kNic, "_PortConnectionType", nullptr, nullptr)                              \
+  X(RM_HA_SUBADAPTER_NUMBER, kText, kNic | kIscsi | kFcoe, "_Subadapter_number", nullptr, nullptr)                    \
+  X(RM_HA_FIRMWARE_ON_FLASH, kText, kNic, "_FirmwareOnFlash", nullptr, nullptr)
 
 struct Row {
   uint16_t number;
@@ -126,7 +127,7 @@ void AdapterAttributes::fill(Kind kind, const std::string& identifierText) {
     if (st != RM_STATUS_SUCCESS)
       NRV_DATA_LOG(NRV_DBG, "ERROR: RM_GetDriverType call failed (%d)", static_cast<int>(st));
     else
-      setInteger(kAttrDriverType, driverType);
+      setInteger(NRV_ATTR_DRIVER_TYPE, driverType);
   }
 }
 

@@ -12,9 +12,6 @@
 
 namespace cimple {
 
-// Label of the FCoE set's driver type (RM_GetDriverType).
-inline constexpr const char* kAttrDriverType = "_DriverType";
-
 class AdapterAttributes : public AttributeSet {
  public:
   // The member lists a set reads (FC sets read the FCoE lists).
@@ -50,8 +47,8 @@ class iSCSIAdapterAttributes : public AdapterAttributes {
   explicit iSCSIAdapterAttributes(const std::string& identifierText);
 };
 
-// Also carries "_DriverType" (RM_GetDriverType) and the IEEE address as six
-// lower-case pairs joined by ":".
+// Also carries NRV_ATTR_DRIVER_TYPE (RM_GetDriverType) and the IEEE address
+// as six lower-case pairs joined by ":".
 class FCoEAdapterAttributes : public AdapterAttributes {
  public:
   explicit FCoEAdapterAttributes(const std::string& identifierText);

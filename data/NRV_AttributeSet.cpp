@@ -3,6 +3,8 @@
 #include <stdio.h>
 #include <string.h>
 
+#include <string_view>
+
 #include "access/RM_Api.h"
 #include "data/NRV_DataLog.h"
 
@@ -31,61 +33,56 @@ std::string hexBytes(const uint8_t* bytes, size_t count, const char* pairFormat,
   return out;
 }
 
+const char* moduleLabel(NRV_ATTRIBUTE key) {
+  switch (key) {
+#define NRV_ATTR_LABEL_(k, label) \
+  case k:                         \
+    return label;
+    NRV_MODULE_ATTRIBUTES(NRV_ATTR_LABEL_)
+#undef NRV_ATTR_LABEL_
+    default:
+      return "";
+  }
+}
+
 }  // namespace
 
 AttributeSet::~AttributeSet() = default;
 
-const AttributeSet::Member* AttributeSet::find(uint16_t number) const {
-  if (number == 0) return nullptr;
+const AttributeSet::Member* AttributeSet::find(uint16_t key) const {
   for (const Member& m : m_Members)
-    if (m.number == number) return &m;
+    if (m.key == key) return &m;
   return nullptr;
 }
 
-const AttributeSet::Member* AttributeSet::find(std::string_view label) const {
-  for (const Member& m : m_Members)
-    if (label == m.label) return &m;
-  return nullptr;
-}
-
-uint32_t AttributeSet::integer(uint16_t number) const {
-  const Member* m = find(number);
+uint32_t AttributeSet::integer(uint16_t key) const {
+  const Member* m = find(key);
   return m != nullptr && !m->isText ? m->value : 0;
 }
 
-uint32_t AttributeSet::integer(std::string_view label) const {
-  const Member* m = find(label);
-  return m != nullptr && !m->isText ? m->value : 0;
-}
-
-const std::string& AttributeSet::text(uint16_t number) const {
-  const Member* m = find(number);
+const std::string& AttributeSet::text(uint16_t key) const {
+  const Member* m = find(key);
   return m != nullptr && m->isText ? m->textValue : kEmpty;
 }
 
-const std::string& AttributeSet::text(std::string_view label) const {
-  const Member* m = find(label);
-  return m != nullptr && m->isText ? m->textValue : kEmpty;
-}
+bool AttributeSet::has(uint16_t key) const { return find(key) != nullptr; }
 
-bool AttributeSet::has(std::string_view label) const { return find(label) != nullptr; }
-
-AttributeSet::Member& AttributeSet::add(uint16_t number, const char* label, bool isText) {
+AttributeSet::Member& AttributeSet::add(uint16_t key, const char* label, bool isText) {
   // A member read twice (the iSCSI set reads 528 twice) stays one member.
   for (Member& m : m_Members)
-    if (m.number == number && std::string_view(m.label) == label) return m;
-  m_Members.push_back(Member{number, label, isText, 0, {}});
+    if (m.key == key && std::string_view(m.label) == label) return m;
+  m_Members.push_back(Member{key, label, isText, 0, {}});
   return m_Members.back();
 }
 
-void AttributeSet::setText(const char* label, std::string value) {
-  Member& m = add(0, label, true);
+void AttributeSet::setText(NRV_ATTRIBUTE key, std::string value) {
+  Member& m = add(key, moduleLabel(key), true);
   m.isText = true;
   m.textValue = std::move(value);
 }
 
-void AttributeSet::setInteger(const char* label, uint32_t value) {
-  Member& m = add(0, label, false);
+void AttributeSet::setInteger(NRV_ATTRIBUTE key, uint32_t value) {
+  Member& m = add(key, moduleLabel(key), false);
   m.isText = false;
   m.value = value;
 }
@@ -142,7 +139,7 @@ void AttributeSet::readFields(void* blob, Scope scope, const std::vector<Field>&
       case Type::kFabric: {
         // Both members exist (empty) even when the record cannot be read.
         add(f.number, f.label, true);
-        add(f.number, "_nFlags", true);
+        add(NRV_ATTR_FABRIC_FLAGS, moduleLabel(NRV_ATTR_FABRIC_FLAGS), true);
         if (!found || length < sizeof(RM_FABRIC_RECORD)) {
           NRV_DATA_LOG(NRV_DBG, "ERROR: RM_GetAttributeValue call failed (%d)", st);
           break;
@@ -154,7 +151,7 @@ void AttributeSet::readFields(void* blob, Scope scope, const std::vector<Field>&
         Member& name = add(f.number, f.label, true);
         name.textValue = hexBytes(fabric.fabricName, 8, "%02x", ":");
         NRV_DATA_LOG(NRV_DBG, "_FabricName: [ %s ]", name.textValue.c_str());
-        Member& flags = add(f.number, "_nFlags", true);
+        Member& flags = add(NRV_ATTR_FABRIC_FLAGS, moduleLabel(NRV_ATTR_FABRIC_FLAGS), true);
         flags.textValue = word;
         NRV_DATA_LOG(NRV_DBG, "_nFlags: [ %s ]", flags.textValue.c_str());
         break;

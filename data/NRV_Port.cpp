@@ -18,7 +18,7 @@ struct PortKind {
   const char* statisticsError;    // null: statistics are not read (NIC)
   const char* statisticsDeleteError;
   const char* attributesDeleteError;
-  const char* secondaryLabel;     // attribute member behind getSecondaryName()
+  uint16_t secondaryKey;          // attribute member behind getSecondaryName(); 0: none
   std::unique_ptr<PortStatistics> (*makeStatistics)(const std::string& portName);
 };
 
@@ -33,21 +33,21 @@ const PortKind kFCPortKind{
     "FC Port ", "FCPort::rescanTargets", true,
     "FC Port statistics error occurred,retain the old statistics !!!",
     "FC Port statistics deletion failed!!!", "FC Port attribute deletion failed!!!",
-    kAttrNodeWWN, makeStatistics<FCPortStatistics>};
+    RM_PA_PORT_NODE_WWN, makeStatistics<FCPortStatistics>};
 const PortKind kNICPortKind{
     "NICPort::NICPort", "NICPort::rescanTargets", false, nullptr,
     "Port Statistics delete error !!!", "Port Attribute delete error!!!",
-    nullptr, makeStatistics<NICPortStatistics>};
+    0, makeStatistics<NICPortStatistics>};
 const PortKind kiSCSIPortKind{
     "iSCSI Port ", "iSCSI::rescanTargets", false,
     "iSCSI Port statistics error occurred,retain the old statistics !!!",
     "Port Statistics delete error!!!", "Port Attribute delete error!!!",
-    kAttrInitiatorName, makeStatistics<iSCSIPortStatistics>};
+    NRV_ATTR_INITIATOR_NAME, makeStatistics<iSCSIPortStatistics>};
 const PortKind kFCoEPortKind{
     "FCoE Port ", "FCoEPort::rescanTargets", true,
     "FCoE Port statistics error occurred,retain the old statistics !!!",
     "Port Statistics delete error!!!", "Port Attribute delete error!!!",
-    kAttrNodeWWN, makeStatistics<FCoEPortStatistics>};
+    RM_PA_PORT_NODE_WWN, makeStatistics<FCoEPortStatistics>};
 
 // Destroys one owned object; a failure is logged and the caller goes on.
 template <class T>
@@ -67,7 +67,7 @@ Port::Port(const PortKind& kind, Adapter& adapter, uint32_t index,
   NRV_DATA_LOG(NRV_DBG, "%s", kind.constructed);
   m_Attributes = readAttributes();
   m_PortName = m_Attributes->getPortIdentifier();
-  if (kind.secondaryLabel != nullptr) m_SecondaryName = m_Attributes->text(kind.secondaryLabel);
+  if (kind.secondaryKey != 0) m_SecondaryName = m_Attributes->text(kind.secondaryKey);
 }
 
 Port::~Port() {

@@ -53,7 +53,8 @@ class Port {
   // The port identifier text (16 upper-case hex digits).
   const std::string& getPortName() const { return m_PortName; }
   uint32_t getPortIndex() const { return m_PortIndex; }
-  // FCoE: the node name ("_NodeWWN"); iSCSI: the initiator name; else "".
+  // FCoE and FC: the node name (RM_PA_PORT_NODE_WWN); iSCSI: the initiator
+  // name; else "".
   const std::string& getSecondaryName() const { return m_SecondaryName; }
 
  protected:

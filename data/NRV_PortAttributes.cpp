@@ -15,57 +15,58 @@ namespace {
 enum KindBit : unsigned { kNic = 1, kIscsi = 2, kFcoe = 4 };
 using Kind = PortAttributes::Kind;
 
-// Every member of the port sets read from the port attribute blob: number,
-// type, kinds that read it, label, and the NIC label where it differs.
-#define NRV_PORT_FIELDS(X)                                                             \
-  X(771, kText, kFcoe, "_PortSymbolicName", nullptr)                                   \
-  X(772, kInteger, kFcoe, "_PortFcId", nullptr)                                        \
-  X(773, kInteger, kFcoe, "_PortType", nullptr)                                        \
-  X(774, kInteger, kNic | kIscsi | kFcoe, "_FunctionalPortState", nullptr)             \
-  X(775, kServiceType, kFcoe, "_PORT_SERVICE_TYPE", nullptr)                           \
-  X(775, kInteger, kFcoe, "_PortSupportedClassofService", nullptr)                     \
-  X(776, kWwn, kIscsi | kFcoe, "_NodeWWN", nullptr)                                    \
-  X(777, kWwn, kIscsi | kFcoe, "_PortWWN", nullptr)                                    \
-  X(778, kInteger, kNic | kIscsi | kFcoe, "_PortSupportedSpeed", "_SupportedPortSpeed") \
-  X(779, kInteger, kNic | kIscsi | kFcoe, "_PortSpeed", nullptr)                       \
-  X(780, kInteger, kFcoe, "_PortMaxFrameSize", nullptr)                                \
-  X(781, kText, kFcoe, "_OSDeviceName", nullptr)                                       \
-  X(782, kInteger, kFcoe, "_NumberofDiscoveredPorts", nullptr)                         \
-  X(783, kFabric, kIscsi | kFcoe, "_FabricName", nullptr)                              \
-  X(784, kInteger, kNic | kIscsi, "_MaximumMTU", nullptr)                              \
-  X(785, kInteger, kIscsi, "_LDTO ", nullptr)                                          \
-  X(786, kInteger, kIscsi, "_DefaultETO ", nullptr)                                    \
-  X(800, kInteger, kNic, "_FunctionType", nullptr)                                     \
-  X(801, kInteger, kIscsi, "_MaxCDBLength", nullptr)                                   \
-  X(802, kInteger, kNic | kIscsi | kFcoe, "_PhysicalPortState", nullptr)               \
-  X(803, kText, kNic, "_IfName", nullptr)                                              \
-  X(804, kText, kNic | kIscsi, "_PermanentMACAddress", nullptr)                        \
-  X(805, kInteger, kNic | kIscsi, "_CurrentMTU ", nullptr)                             \
-  X(806, kText, kNic, "_ProtocolIFType", nullptr)                                      \
-  X(807, kText, kNic, "_LinkTechnology", nullptr)                                      \
-  X(808, kText, kNic, "_Capabilities", nullptr)                                        \
-  X(809, kText, kNic, "_EnabledCapabilities", nullptr)                                 \
-  X(810, kText, kNic, "_IPProtocolEndpointName", nullptr)                              \
-  X(811, kText, kNic, "_IPProtocolIFType", nullptr)                                    \
-  X(812, kText, kNic, "_IPv4Address", nullptr)                                         \
-  X(813, kText, kNic, "_SubnetMask", nullptr)                                          \
-  X(814, kText, kNic, "_AddressOrigin", nullptr)                                       \
-  X(815, kText, kNic | kIscsi | kFcoe, "_FuncPortSpeed", nullptr)                      \
-  X(816, kText, kNic | kIscsi | kFcoe, "_FuncQosBandwidth", nullptr)                   \
-  X(817, kInteger, kNic, "_SpecialFeature", nullptr)                                   \
-  X(818, kInteger, kNic, "_vNICEnabledState", nullptr)                                 \
-  X(819, kText, kNic, "_VNICName", nullptr)                                            \
-  X(820, kInteger, kNic, "_vNICOuterVLANId", nullptr)                                  \
-  X(821, kText, kNic, "_VNICMinBandwidth", nullptr)                                    \
-  X(822, kText, kNic, "_VNICMaxBandwidth", nullptr)                                    \
-  X(823, kInteger, kFcoe, "_PFCThrottle", nullptr)                                     \
-  X(842, kInteger, kIscsi | kFcoe, "_PhysicalPortSpeed", nullptr)                      \
-  X(843, kText, kNic, "_GatewayAddress", nullptr)                                      \
-  X(853, kInteger, kNic, "_SRIOVState", nullptr)                                       \
-  X(855, kInteger, kNic | kIscsi | kFcoe, "_PhyLinkDownReason", nullptr)               \
-  X(856, kText, kNic | kIscsi, "_FuncQosMinBandwidth", nullptr)                        \
-  X(857, kText, kNic | kIscsi, "_IPV6GatewayAddr", nullptr)                            \
-  X(865, kInteger, kNic, "_VEPAState", nullptr)
+// Every member of the port sets read from the port attribute blob: attribute
+// number, type, kinds that read it, label, and the NIC label where it differs
+// (labels only name the member in the log; some end in a blank).
+#define NRV_PORT_FIELDS(X)                                                                                     \
+  X(RM_PA_PORT_SYMBOLIC_NAME, kText, kFcoe, "_PortSymbolicName", nullptr)                                      \
+  X(RM_PA_PORT_FC_ID, kInteger, kFcoe, "_PortFcId", nullptr)                                                   \
+  X(RM_PA_PORT_TYPE, kInteger, kFcoe, "_PortType", nullptr)                                                    \
+  X(RM_PA_PORT_STATE, kInteger, kNic | kIscsi | kFcoe, "_FunctionalPortState", nullptr)                        \
+  X(RM_PA_PORT_SERVICE_TYPE, kServiceType, kFcoe, "_PORT_SERVICE_TYPE", nullptr)                               \
+  X(RM_PA_PORT_SERVICE_TYPE, kInteger, kFcoe, "_PortSupportedClassofService", nullptr)                         \
+  X(RM_PA_PORT_NODE_WWN, kWwn, kIscsi | kFcoe, "_NodeWWN", nullptr)                                            \
+  X(RM_PA_PORT_PORT_WWN, kWwn, kIscsi | kFcoe, "_PortWWN", nullptr)                                            \
+  X(RM_PA_PORT_SUPPORTED_SPEED, kInteger, kNic | kIscsi | kFcoe, "_PortSupportedSpeed", "_SupportedPortSpeed") \
+  X(RM_PA_PORT_SPEED, kInteger, kNic | kIscsi | kFcoe, "_PortSpeed", nullptr)                                  \
+  X(RM_PA_PORT_MAX_FRAME_SIZE, kInteger, kFcoe, "_PortMaxFrameSize", nullptr)                                  \
+  X(RM_PA_OS_DEVICE_NAME, kText, kFcoe, "_OSDeviceName", nullptr)                                              \
+  X(RM_PA_NUMBER_OF_DISCOVERED_PORTS, kInteger, kFcoe, "_NumberofDiscoveredPorts", nullptr)                    \
+  X(RM_PA_FABRIC, kFabric, kIscsi | kFcoe, "_FabricName", nullptr)                                             \
+  X(RM_PA_MAXIMUM_MTU, kInteger, kNic | kIscsi, "_MaximumMTU", nullptr)                                        \
+  X(RM_PA_LDTO, kInteger, kIscsi, "_LDTO ", nullptr)                                                           \
+  X(RM_PA_DEFAULT_ETO, kInteger, kIscsi, "_DefaultETO ", nullptr)                                              \
+  X(RM_PA_FUNCTION_TYPE, kInteger, kNic, "_FunctionType", nullptr)                                             \
+  X(RM_PA_MAX_CDB_LENGTH, kInteger, kIscsi, "_MaxCDBLength", nullptr)                                          \
+  X(RM_PA_PHYSICAL_PORT_STATE, kInteger, kNic | kIscsi | kFcoe, "_PhysicalPortState", nullptr)                 \
+  X(RM_PA_IF_NAME, kText, kNic, "_IfName", nullptr)                                                            \
+  X(RM_PA_PERMANENT_MAC_ADDRESS, kText, kNic | kIscsi, "_PermanentMACAddress", nullptr)                        \
+  X(RM_PA_CURRENT_MTU, kInteger, kNic | kIscsi, "_CurrentMTU ", nullptr)                                       \
+  X(RM_PA_PROTOCOL_IF_TYPE, kText, kNic, "_ProtocolIFType", nullptr)                                           \
+  X(RM_PA_LINK_TECHNOLOGY, kText, kNic, "_LinkTechnology", nullptr)                                            \
+  X(RM_PA_CAPABILITIES, kText, kNic, "_Capabilities", nullptr)                                                 \
+  X(RM_PA_ENABLED_CAPABILITIES, kText, kNic, "_EnabledCapabilities", nullptr)                                  \
+  X(RM_PA_IP_PROTOCOL_ENDPOINT_NAME, kText, kNic, "_IPProtocolEndpointName", nullptr)                          \
+  X(RM_PA_IP_PROTOCOL_IF_TYPE, kText, kNic, "_IPProtocolIFType", nullptr)                                      \
+  X(RM_PA_IPV4_ADDRESS, kText, kNic, "_IPv4Address", nullptr)                                                  \
+  X(RM_PA_SUBNET_MASK, kText, kNic, "_SubnetMask", nullptr)                                                    \
+  X(RM_PA_ADDRESS_ORIGIN, kText, kNic, "_AddressOrigin", nullptr)                                              \
+  X(RM_PA_FUNC_PORT_SPEED, kText, kNic | kIscsi | kFcoe, "_FuncPortSpeed", nullptr)                            \
+  X(RM_PA_FUNC_QOS_BANDWIDTH, kText, kNic | kIscsi | kFcoe, "_FuncQosBandwidth", nullptr)                      \
+  X(RM_PA_SPECIAL_FEATURE, kInteger, kNic, "_SpecialFeature", nullptr)                                         \
+  X(RM_PA_VNIC_ENABLED_STATE, kInteger, kNic, "_vNICEnabledState", nullptr)                                    \
+  X(RM_PA_VNIC_NAME, kText, kNic, "_VNICName", nullptr)                                                        \
+  X(RM_PA_VNIC_OUTER_VLAN_ID, kInteger, kNic, "_vNICOuterVLANId", nullptr)                                     \
+  X(RM_PA_VNIC_MIN_BANDWIDTH, kText, kNic, "_VNICMinBandwidth", nullptr)                                       \
+  X(RM_PA_VNIC_MAX_BANDWIDTH, kText, kNic, "_VNICMaxBandwidth", nullptr)                                       \
+  X(RM_PA_PFC_THROTTLE, kInteger, kFcoe, "_PFCThrottle", nullptr)                                              \
+  X(RM_PA_PHYSICAL_PORT_SPEED, kInteger, kIscsi | kFcoe, "_PhysicalPortSpeed", nullptr)                        \
+  X(RM_PA_GATEWAY_ADDRESS, kText, kNic, "_GatewayAddress", nullptr)                                            \
+  X(RM_PA_SRIOV_STATE, kInteger, kNic, "_SRIOVState", nullptr)                                                 \
+  X(RM_PA_PHY_LINK_DOWN_REASON, kInteger, kNic | kIscsi | kFcoe, "_PhyLinkDownReason", nullptr)                \
+  X(RM_PA_FUNC_QOS_MIN_BANDWIDTH, kText, kNic | kIscsi, "_FuncQosMinBandwidth", nullptr)                       \
+  X(RM_PA_IPV6_GATEWAY_ADDR, kText, kNic | kIscsi, "_IPV6GatewayAddr", nullptr)                                \
+  X(RM_PA_VEPA_STATE, kInteger, kNic, "_VEPAState", nullptr)
 
 struct Row {
   uint16_t number;
@@ -108,7 +109,7 @@ const char* authMethodText(HBA_UINT32 method) {
 
 void PortAttributes::fill(Kind kind, const std::string& identifierText,
                           const RM_LOCAL_HBA_INFO_V4* info) {
-  setText(kAttrPortIdentifier, identifierText);
+  setText(NRV_ATTR_PORT_IDENTIFIER, identifierText);
   NRV_DATA_LOG(NRV_DBG, "Port 0's WWPN: %s", identifierText.c_str());
   HBA_NAME name{};
   if (string2HBAName(&name, identifierText.c_str()) != 1) {
@@ -138,18 +139,18 @@ void PortAttributes::readIscsiRecords(const HBA_NAME& name) {
   if (LRM_Ini_GetNetworkProperties(name, &net, &size) != RM_STATUS_SUCCESS) {
     NRV_DATA_LOG(NRV_ERR, "ERROR: HBACMD_GetNetConfig: RM_iSCSI_GetNetConfig() Failed.");
   } else {
-    const std::pair<const char*, const RM_IP_ADDRESS*> addresses[] = {
-        {kAttrNetIPAddress, &net.ipv4Address},
-        {kAttrNetSubnetMask, &net.subnetMask},
-        {kAttrNetGateway, &net.gateway},
+    const std::pair<NRV_ATTRIBUTE, const RM_IP_ADDRESS*> addresses[] = {
+        {NRV_ATTR_NET_IP_ADDRESS, &net.ipv4Address},
+        {NRV_ATTR_NET_SUBNET_MASK, &net.subnetMask},
+        {NRV_ATTR_NET_GATEWAY, &net.gateway},
     };
-    for (const auto& [label, address] : addresses) {
+    for (const auto& [key, address] : addresses) {
       std::string textForm;
       ipInfo2String(*address, textForm);
-      setText(label, std::move(textForm));
+      setText(key, std::move(textForm));
     }
-    setInteger(kAttrNetVLANId, net.vlanId);
-    setInteger(kAttrNetVLANEnabled, net.vlanEnabled);
+    setInteger(NRV_ATTR_NET_VLAN_ID, net.vlanId);
+    setInteger(NRV_ATTR_NET_VLAN_ENABLED, net.vlanEnabled);
   }
 
   RM_ISCSI_INITIATOR_PROPERTIES props{};
@@ -159,13 +160,13 @@ void PortAttributes::readIscsiRecords(const HBA_NAME& name) {
     return;
   }
   auto bounded = [](const char* p, size_t size) { return std::string(p, strnlen(p, size)); };
-  setText(kAttrInitiatorName, bounded(props.initiatorName, sizeof props.initiatorName));
-  setText(kAttrInitiatorAlias, bounded(props.initiatorAlias, sizeof props.initiatorAlias));
-  setText(kAttrAuthMethod, authMethodText(props.auth.method));
+  setText(NRV_ATTR_INITIATOR_NAME, bounded(props.initiatorName, sizeof props.initiatorName));
+  setText(NRV_ATTR_INITIATOR_ALIAS, bounded(props.initiatorAlias, sizeof props.initiatorAlias));
+  setText(NRV_ATTR_AUTH_METHOD, authMethodText(props.auth.method));
   if (props.auth.method == RM_AUTH_NONE)
-    setText(kAttrCHAPName, "Not Available");
+    setText(NRV_ATTR_CHAP_NAME, "Not Available");
   else if (props.auth.method == RM_AUTH_ONE_WAY_CHAP)
-    setText(kAttrCHAPName, bounded(props.auth.initiatorChapName, sizeof props.auth.initiatorChapName));
+    setText(NRV_ATTR_CHAP_NAME, bounded(props.auth.initiatorChapName, sizeof props.auth.initiatorChapName));
 }
 
 FCPortAttributes::FCPortAttributes(const std::string& identifierText) {

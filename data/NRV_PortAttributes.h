@@ -3,12 +3,13 @@
 //
 // Contract: each constructor reads once for the adapter identifier given and
 // never fails: a record that cannot be read leaves its members at 0 / "".
-// Every kind carries "_WWPN", the port identifier text (16 upper-case hex
-// digits) that names the port; FCoE and iSCSI sets add "_NodeWWN",
-// "_PortWWN" (eight hex pairs), "_FabricName" and "_nFlags"; the NIC set
-// "_SpecialFeature"; the iSCSI set the network settings ("_IPAddress",
-// "_SubnetMask", "_Gateway", "_VLANId", "_VLANEnabled") and the initiator
-// ("_InitiatorName", "_InitiatorAlias", "_AuthMethod", "_CHAPName").
+// Every kind carries NRV_ATTR_PORT_IDENTIFIER, the port identifier text (16
+// upper-case hex digits) that names the port; FCoE and iSCSI sets add the
+// node and port names (RM_PA_PORT_NODE_WWN, RM_PA_PORT_PORT_WWN: 16 hex
+// digits), the fabric name (RM_PA_FABRIC) and NRV_ATTR_FABRIC_FLAGS; the NIC
+// set RM_PA_SPECIAL_FEATURE; the iSCSI set the network settings
+// (NRV_ATTR_NET_*) and the initiator (NRV_ATTR_INITIATOR_NAME, _ALIAS,
+// NRV_ATTR_AUTH_METHOD, NRV_ATTR_CHAP_NAME).
 #pragma once
 
 #include "access/RM_Types.h"
@@ -16,30 +17,13 @@
 
 namespace cimple {
 
-// Labels of the members added beyond the blob, for readers of the sets.
-inline constexpr const char* kAttrPortIdentifier = "_WWPN";
-inline constexpr const char* kAttrNodeWWN = "_NodeWWN";
-inline constexpr const char* kAttrPortWWN = "_PortWWN";
-inline constexpr const char* kAttrFabricName = "_FabricName";
-inline constexpr const char* kAttrFabricFlags = "_nFlags";
-inline constexpr const char* kAttrSpecialFeature = "_SpecialFeature";
-inline constexpr const char* kAttrNetIPAddress = "_NetIPAddress";
-inline constexpr const char* kAttrNetSubnetMask = "_NetSubnetMask";
-inline constexpr const char* kAttrNetGateway = "_NetGateway";
-inline constexpr const char* kAttrNetVLANId = "_NetVLANId";
-inline constexpr const char* kAttrNetVLANEnabled = "_NetVLANEnabled";
-inline constexpr const char* kAttrInitiatorName = "_InitiatorName";
-inline constexpr const char* kAttrInitiatorAlias = "_InitiatorAlias";
-inline constexpr const char* kAttrAuthMethod = "_AuthMethod";
-inline constexpr const char* kAttrCHAPName = "_CHAPName";
-
 class PortAttributes : public AttributeSet {
  public:
   // The member lists a set reads (FC sets read the FCoE lists).
   enum class Kind { kNic, kIscsi, kFcoe };
 
-  // The port identifier text ("_WWPN").
-  const std::string& getPortIdentifier() const { return text(kAttrPortIdentifier); }
+  // The port identifier text.
+  const std::string& getPortIdentifier() const { return text(NRV_ATTR_PORT_IDENTIFIER); }
 
  protected:
   PortAttributes() = default;

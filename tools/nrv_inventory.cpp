@@ -36,14 +36,14 @@ void print_adapter(const Adapter& adapter) {
   std::printf("%-5s %s  id %s", kind_name(adapter.getAdapterType()), adapter.getAdapterName().c_str(),
               adapter.getIdentifierText().c_str());
   if (attributes)
-    std::printf("  serial %s  firmware %s", attributes->text("_SerialNumber").c_str(),
-                attributes->text("_FirmwareVersion").c_str());
+    std::printf("  serial %s  firmware %s", attributes->text(RM_HA_SERIAL_NUMBER).c_str(),
+                attributes->text(RM_HA_FIRMWARE_VERSION).c_str());
   std::printf("\n");
   for (const auto& port : adapter.getPorts()) {
     const PortAttributes* p = port->getAttributes();
     std::printf("    port %u  %s", port->getPortIndex(), port->getPortName().c_str());
     if (!port->getSecondaryName().empty()) std::printf("  (%s)", port->getSecondaryName().c_str());
-    if (p) std::printf("  state %u  speed %u", p->integer("_PhysicalPortState"), p->integer("_PortSpeed"));
+    if (p) std::printf("  state %u  speed %u", p->integer(RM_PA_PHYSICAL_PORT_STATE), p->integer(RM_PA_PORT_SPEED));
     std::printf("  %zu LUN(s)\n", port->getNumberOfTargets());
     print_targets(*port);
   }
