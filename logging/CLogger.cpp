@@ -119,6 +119,7 @@ auto CLogger::withFileSink(Fn fn) const {
 }
 
 int CLogger::setTracePath(const std::string& path) {
+  if (path.size() > kNrvTracePathMax) return -1;
   const bool errorsOnly = isErrorsOnly();
   return withFileSink([&](NRV_FileLogger* file) {
     return file != nullptr ? file->open(path.c_str(), errorsOnly) : -1;

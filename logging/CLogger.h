@@ -91,7 +91,8 @@ class CLogger {
   void clearAllLogs();
 
   // Opens `path` in the first registered file sink with the errors-only flag.
-  // 0 on success; -1 when it cannot be opened or no file sink is registered.
+  // 0 on success; -1 when it cannot be opened, is longer than the data file
+  // can carry (kNrvTracePathMax) or no file sink is registered.
   int setTracePath(const std::string& path);
   // The first file sink's path; empty when none is open or none is registered.
   std::string tracePath() const;
@@ -99,7 +100,7 @@ class CLogger {
   // The configuration data file ("dump file") of this logger.
   NRV_LogDataFile& dataFile() { return m_DataFile; }
   void readConfigDataFile() { m_DataFile.read(); }
-  void writeConfigDataFile() { m_DataFile.write(); }
+  bool writeConfigDataFile() { return m_DataFile.write(); }
   bool checkDumpFileAccess() { return m_DataFile.checkAccess(); }
 
  private:
