@@ -211,7 +211,9 @@ void ProviderAgent::destruct() {
 
     NRV_LOG(NRV_INFO, "Norvane Provider Unloaded");
     NRV_Runtime_Loader::unloadLibraries();
-    CLogger::instance().unregisterAll();
+    // The sinks die with the agent; what the logger allocated goes too, so
+    // a module unloaded now leaves nothing behind.
+    CLogger::instance().release();
   } catch (...) {
     NRV_LOG(NRV_ERR, "Error in ProviderAgent unload. Just continue");
   }

@@ -6,7 +6,9 @@
 // One logger mutex serialises the sink list and all sink output; a sink must
 // never log.  The settings (mode, level, enabled, errors-only) are atomic so
 // any thread may read them while the configuration paths change them.
-// instance() is never destroyed, so logging from static destructors is safe.
+// instance() is never destroyed, so logging from static destructors is safe;
+// it lives in static storage, and release() hands back what it allocated, so
+// a module unloaded by its CIMOM leaves no logger behind.
 #pragma once
 
 #include <atomic>
@@ -65,6 +67,10 @@ class CLogger {
   // Removes every occurrence; 1 when it was registered, else 0.
   int unregisterSink(NRV_LoggerInterface* sink);
   void unregisterAll();
+  // Unregisters every sink and frees the sink list and the data file's
+  // remembered path (computed again on next need).  For the last user of the
+  // module (the agent's destruction); the logger stays usable.
+  void release();
   size_t sinkCount() const;
 
   // Stores the mode, then starts every sink (non-zero) or stops it (0).

@@ -74,6 +74,14 @@ void NRV_LogDataFile::setReadOnlyRootProbe(ReadOnlyRootProbe probe) {
   m_bDumpPathKnown = false;
 }
 
+void NRV_LogDataFile::release() {
+  std::lock_guard<std::mutex> lock(m_Mutex);
+  m_ReadOnlyRoot = nullptr;
+  std::string().swap(m_DumpPath);
+  m_bDumpPathKnown = false;
+  m_bRejected = false;
+}
+
 std::string NRV_LogDataFile::computePath() {
   const bool read_only = m_ReadOnlyRoot && m_ReadOnlyRoot();
   m_DumpPath = system_path(read_only ? kNrvReadOnlyRootDumpFile : kNrvDumpFile);

@@ -62,6 +62,10 @@ class NRV_LogDataFile {
   // Reads the file and applies what it holds; see the .cpp for the steps.
   void read();
 
+  // Forgets the path and the read-only probe (which may point into an
+  // unloaded module) and frees what they held.
+  void release();
+
   // Start-up fallback: when the file is not readable, switches the logger to
   // errors-only file logging on the fault-data file and answers true.
   bool applyDefaultIfMissing();
