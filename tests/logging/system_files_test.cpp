@@ -16,9 +16,9 @@
 
 #include <gtest/gtest.h>
 
-#include "access/NRV_FileRewrite.h"
-#include "access/NRV_RegularFile.h"
-#include "access/NRV_SystemPaths.h"
+#include "logging/NRV_FileRewrite.h"
+#include "logging/NRV_RegularFile.h"
+#include "logging/NRV_SystemPaths.h"
 #include "tests/common/Special_Files.h"
 
 using namespace cimple;
