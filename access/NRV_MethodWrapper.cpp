@@ -19,6 +19,27 @@ namespace {
 // Reading the semaphore's value and taking it must be one step, or two
 // wrappers constructed at once could both see the initial value.
 std::mutex g_initMutex;
+// Wrappers of this process that hold the initialisation semaphore; guarded
+// by g_initMutex.  While none does, a semaphore carrying this process's id
+// was left by an earlier process that had the same id and died holding it:
+// opened as it is, it would block every provider load for ever.
+int g_liveWrappers = 0;
+
+void removeStale(const std::string& name) {
+  if (sem_unlink(name.c_str()) == 0) NRV_LOG(NRV_WARN, "Removed stale semaphore %s", name.c_str());
+}
+
+// The initialisation semaphore, made afresh unless a live wrapper of this
+// process has it; SEM_FAILED when it can be neither made nor opened.
+sem_t* openInitSemaphore(const std::string& name, const std::string& doneName) {
+  if (g_liveWrappers == 0) {
+    removeStale(name);
+    removeStale(doneName);
+  }
+  sem_t* sem = sem_open(name.c_str(), O_CREAT | O_EXCL, 0644, 2);
+  if (sem == SEM_FAILED && errno == EEXIST) sem = sem_open(name.c_str(), 0);
+  return sem;
+}
 
 void waitOn(sem_t* sem) {
   while (sem_wait(sem) != 0 && errno == EINTR) {
@@ -46,15 +67,16 @@ NRV_MethodWrapper::NRV_MethodWrapper()
     : m_SemName(initSemaphoreName()), m_DoneSemName(doneSemaphoreName()) {
   NRV_LOG(NRV_DBG, "NRV_MethodWrapper::Constructor");
   NRV_LOG(NRV_DBG, "Setting Up for FIFO.. ");
-  sem_t* sem = sem_open(m_SemName.c_str(), O_CREAT, 0644, 2);
-  if (sem == SEM_FAILED) {
-    NRV_LOG(NRV_DBG, "RM Library initialized");
-    return;
-  }
-  m_Sem = sem;
   bool first = false;
   {
     std::lock_guard<std::mutex> lock(g_initMutex);
+    sem_t* sem = openInitSemaphore(m_SemName, m_DoneSemName);
+    if (sem == SEM_FAILED) {
+      NRV_LOG(NRV_DBG, "RM Library initialized");
+      return;
+    }
+    m_Sem = sem;
+    ++g_liveWrappers;
     int value = 0;
     sem_getvalue(m_Sem, &value);
     first = value == 2;
@@ -70,8 +92,7 @@ NRV_MethodWrapper::NRV_MethodWrapper()
       NRV_LOG(NRV_CRIT, "Error : Initialization of RMLib:: RM_InitLib failed with[%d]",
               static_cast<int>(status));
       sem_post(m_Sem);
-      closeAndUnlink(m_Sem, m_SemName);
-      closeAndUnlink(m_DoneSem, m_DoneSemName);
+      releaseSemaphores();
       throw std::runtime_error("RM_InitLib failed");
     }
     NRV_LOG(NRV_DBG, "Signalling Completed Semaphore.. Running RM_InitLib");
@@ -93,11 +114,17 @@ NRV_MethodWrapper::~NRV_MethodWrapper() {
     int value = 0;
     sem_getvalue(m_Sem, &value);
     NRV_LOG(NRV_DBG, "Value of Sem in destructor=%d", value);
-    closeAndUnlink(m_Sem, m_SemName);
   }
+  releaseSemaphores();
+  NRV_LOG(NRV_DBG, "RM Library uninitialzed");
+}
+
+void NRV_MethodWrapper::releaseSemaphores() {
+  std::lock_guard<std::mutex> lock(g_initMutex);
+  if (m_Sem != nullptr) --g_liveWrappers;
+  closeAndUnlink(m_Sem, m_SemName);
   // The completion semaphore would otherwise outlive the process in /dev/shm.
   closeAndUnlink(m_DoneSem, m_DoneSemName);
-  NRV_LOG(NRV_DBG, "RM Library uninitialzed");
 }
 
 // ---- Adapter tests ------------------------------------------------------------

@@ -286,6 +286,9 @@ class NRV_MethodWrapper {
                            std::vector<std::pair<std::string, std::string>>& entries);
 
  private:
+  // Closes and removes both semaphores and stops counting this wrapper.
+  void releaseSemaphores();
+
   sem_t* m_Sem = nullptr;      // "/NRV_RM_INIT_LIB_<pid>", held while alive
   sem_t* m_DoneSem = nullptr;  // "/NRV_RM_INIT_LIB_DONE_<pid>", first initialiser only
   std::string m_SemName;

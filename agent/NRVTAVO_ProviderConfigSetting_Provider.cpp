@@ -110,9 +110,16 @@ int NRVTAVO_ProviderConfigSetting_Provider::modify_instance(const Instance* mode
   const int64_t v = given->current.is_null() ? -1 : static_cast<int64_t>(given->current.value);
   if (index < std::size(kChanges)) {
     const Setting_Change& change = kChanges[index];
-    if ((agent.m_ConfigFile.*change.set)(v) != 0) {
-      NRV_LOG(NRV_ERR, "%s", change.refused);
-      return MODIFY_INSTANCE_INVALID_PARAMETER;
+    switch (agent.m_ConfigFile.change(change.set, v)) {
+      case NrvConfigFile::Change::OutOfRange:
+        NRV_LOG(NRV_ERR, "%s", change.refused);
+        return MODIFY_INSTANCE_INVALID_PARAMETER;
+      case NrvConfigFile::Change::NotSaved:
+        // A change that would be lost at the next start is no change: the
+        // old value stays in force and the client is told.
+        return MODIFY_INSTANCE_FAILED;
+      case NrvConfigFile::Change::Saved:
+        break;
     }
     change.apply(agent, v);
     NRV_LOG(NRV_WARN, "%s", change.done);

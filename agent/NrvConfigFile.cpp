@@ -1,13 +1,12 @@
 #include "agent/NrvConfigFile.h"
 
-#include <sys/stat.h>
-
 #include <cerrno>
 #include <cstdio>
 #include <cstdlib>
-#include <cstring>
-#include <memory>
+#include <string_view>
 
+#include "logging/NRV_FileRewrite.h"
+#include "logging/NRV_RegularFile.h"
 #include "logging/NRV_SystemPaths.h"
 #include "logging/Log.h"
 
@@ -15,14 +14,10 @@ namespace cimple {
 
 namespace {
 
-struct FileCloser {
-  void operator()(std::FILE* f) const { std::fclose(f); }
-};
-using File = std::unique_ptr<std::FILE, FileCloser>;
-
-constexpr int kMaxLines = 1000;
-constexpr size_t kLineBuffer = 1024;        // 1023 characters and the NUL
-constexpr size_t kWebLaunchBuffer = 257;    // 255 characters, the line feed, the NUL
+// Far beyond any hand-written settings file, small enough to hold in memory.
+constexpr size_t kConfigFileMax = 1 << 20;
+constexpr size_t kWebLaunchFileMax = 64 << 10;
+constexpr size_t kMaxLine = 1023;
 constexpr size_t kWebLaunchMaxLine = 255;
 
 constexpr const char* kCacheTimeoutKey = "NRV_PROVIDER_CACHE_TIMEOUT";
@@ -33,11 +28,15 @@ enum Key_Bit : unsigned { kCacheTimeoutBit = 1, kRefreshAdapterBit = 2, kRefresh
 
 bool is_blank(char c) { return c == ' ' || c == '\t' || c == '\n' || c == '\r' || c == '\v' || c == '\f'; }
 
-std::string trim(const std::string& text) {
-  size_t begin = 0, end = text.size();
-  while (begin < end && is_blank(text[begin])) ++begin;
-  while (end > begin && is_blank(text[end - 1])) --end;
-  return text.substr(begin, end - begin);
+std::string_view trim_front(std::string_view text) {
+  while (!text.empty() && is_blank(text.front())) text.remove_prefix(1);
+  return text;
+}
+
+std::string trim(std::string_view text) {
+  text = trim_front(text);
+  while (!text.empty() && is_blank(text.back())) text.remove_suffix(1);
+  return std::string(text);
 }
 
 // "TRUE" -> 1, "FALSE" -> 0, anything else -1 (case matters).
@@ -65,17 +64,21 @@ NrvConfigFile::~NrvConfigFile() { write(); }
 void NrvConfigFile::read(const std::string& path) {
   std::lock_guard<std::recursive_mutex> lock(m_Mutex);
   m_Path = path;
-  struct stat st;
-  if (::stat(path.c_str(), &st) != 0) return;  // no file: the defaults stand
-  File file(std::fopen(path.c_str(), "r"));
-  if (!file) {
+  // A FIFO or device here would stall the agent's construction, and with it
+  // every provider load: only a regular file is read.
+  const File_Text file = read_regular_file(path, kConfigFileMax);
+  if (file.status == File_Status::Missing) return;  // no file: the defaults stand
+  if (!file.ok()) {
     NRV_LOG(NRV_ERR, "Unable to open provider config setting file - %s", path.c_str());
     return;
   }
   unsigned taken = 0;
-  char buffer[kLineBuffer];
-  for (int n = 0; n < kMaxLines && std::fgets(buffer, sizeof buffer, file.get()) != nullptr; ++n)
-    applyLine(trim(buffer), taken);
+  for (std::string_view line : split_lines(file.text)) {
+    // Read in pieces, the tail of a long comment would count as a setting:
+    // a line longer than any setting line is skipped whole.
+    if (line.size() > kMaxLine) continue;
+    applyLine(trim(line), taken);
+  }
 }
 
 void NrvConfigFile::applyLine(const std::string& line, unsigned& taken) {
@@ -103,16 +106,35 @@ void NrvConfigFile::applyLine(const std::string& line, unsigned& taken) {
   taken |= bit;
 }
 
-void NrvConfigFile::write() {
+std::string NrvConfigFile::text() const {
   std::lock_guard<std::recursive_mutex> lock(m_Mutex);
-  if (m_Path.empty()) return;
-  File file(std::fopen(m_Path.c_str(), "w"));
-  if (!file) return;
-  const char* rule = "##################################################";
-  std::fprintf(file.get(), "%s\n# Norvane HBA CIM Provider Configuration Settings #\n%s\n", rule, rule);
-  std::fprintf(file.get(), "%s = %d\n", kCacheTimeoutKey, m_CacheTimeout);
-  std::fprintf(file.get(), "%s = %s\n", kRefreshAdapterKey, flag_text(m_bRefreshAdapterData));
-  std::fprintf(file.get(), "%s = %s\n", kRefreshSANKey, flag_text(m_bRefreshSANData));
+  const std::string rule(50, '#');
+  std::string text = rule + "\n# Norvane HBA CIM Provider Configuration Settings #\n" + rule + "\n";
+  text += std::string(kCacheTimeoutKey) + " = " + std::to_string(m_CacheTimeout) + "\n";
+  text += std::string(kRefreshAdapterKey) + " = " + flag_text(m_bRefreshAdapterData) + "\n";
+  text += std::string(kRefreshSANKey) + " = " + flag_text(m_bRefreshSANData) + "\n";
+  return text;
+}
+
+bool NrvConfigFile::write() {
+  std::lock_guard<std::recursive_mutex> lock(m_Mutex);
+  if (m_Path.empty()) return true;
+  const Rewrite_Result result = rewrite_file(m_Path, text());
+  if (result.ok()) return true;
+  NRV_LOG(NRV_ERR, "Unable to write provider config setting file - %s: %s", m_Path.c_str(),
+          rewrite_failure_text(result).c_str());
+  return false;
+}
+
+NrvConfigFile::Change NrvConfigFile::change(int (NrvConfigFile::*setter)(int64_t), int64_t value) {
+  std::lock_guard<std::recursive_mutex> lock(m_Mutex);
+  const Settings old = settings();
+  if ((this->*setter)(value) != 0) return Change::OutOfRange;
+  if (write()) return Change::Saved;
+  m_CacheTimeout = old.cacheTimeout;
+  m_bRefreshAdapterData = old.refreshAdapterData;
+  m_bRefreshSANData = old.refreshSANData;
+  return Change::NotSaved;
 }
 
 int NrvConfigFile::setCacheTimeout(int64_t minutes) {
@@ -163,22 +185,22 @@ std::string NrvConfigFile::path() const {
 
 std::string NrvConfigFile::readWebLaunchAddress() {
   const std::string path = system_path(kNrvWebLaunchFile);
-  File file(std::fopen(path.c_str(), "r"));
-  if (!file) {
+  const File_Text file = read_regular_file(path, kWebLaunchFileMax);
+  if (file.status == File_Status::Missing) {
     NRV_LOG(NRV_INFO, "WebLaunch config file '%s' not found.", path.c_str());
     return {};
   }
-  char buffer[kWebLaunchBuffer];
-  while (std::fgets(buffer, sizeof buffer, file.get()) != nullptr) {
-    size_t length = std::strlen(buffer);
-    const bool terminated = length > 0 && buffer[length - 1] == '\n';
-    if (terminated) buffer[--length] = '\0';
+  if (!file.ok()) {
+    NRV_LOG(NRV_ERR, "Unable to read WebLaunch config file '%s': %s", path.c_str(),
+            file_status_text(file.status, file.error).c_str());
+    return {};
+  }
+  for (std::string_view line : split_lines(file.text)) {
     // A line that does not fit ends the reading with nothing found.
-    if (length > kWebLaunchMaxLine || (!terminated && !std::feof(file.get()))) return {};
-    const char* text = buffer;
-    while (*text != '\0' && is_blank(*text)) ++text;
-    if (*text == '\0' || *text == '#') continue;
-    return text;
+    if (line.size() > kWebLaunchMaxLine) return {};
+    const std::string_view text = trim_front(line);
+    if (text.empty() || text.front() == '#') continue;
+    return std::string(text);
   }
   return {};
 }

@@ -1,13 +1,15 @@
 // NrvConfigFile: the three cache settings of the provider (cache timeout,
 // adapter refresh, SAN refresh), read once from the provider configuration
-// file when the agent starts and written back when it ends; plus the reader
-// of the one-line WebLaunch file.
+// file when the agent starts, saved whenever one is changed and again when
+// the agent ends; plus the reader of the one-line WebLaunch file.
 //
 // Contract: every operation is safe from any thread (one recursive mutex
-// guards the settings).  Reading and writing never fail to the caller: a
-// missing, unreadable or garbled file leaves the defaults or the values read
-// so far, an unwritable one is skipped silently.  The destructor writes the
-// file back to the path last given to read().
+// guards the settings).  Reading never fails to the caller: a missing,
+// unreadable, non-regular or garbled file leaves the defaults or the values
+// read so far (logged unless the file is missing).  Writing replaces the file
+// whole or not at all, skips a file that already holds the settings, and
+// logs and answers false when it cannot (a missing directory included).
+// The destructor writes the file back to the path last given to read().
 #pragma once
 
 #include <cstdint>
@@ -39,8 +41,17 @@ class NrvConfigFile {
 
   // Stores `path` (already relocated) and applies the settings it holds.
   void read(const std::string& path);
-  // Rewrites the file at the stored path from the current settings.
-  void write();
+  // Rewrites the file at the stored path from the current settings; false
+  // (logged) when it could not be written.  True when no path was read.
+  bool write();
+  // The file's content for the current settings (six lines).
+  std::string text() const;
+
+  // Sets one setting with `setter` (one of the three below) and saves the
+  // file at once, so the change survives however the agent ends.  When the
+  // file cannot be written the old value is put back.
+  enum class Change { Saved, OutOfRange, NotSaved };
+  Change change(int (NrvConfigFile::*setter)(int64_t), int64_t value);
 
   // Each answers 0, or -1 and changes nothing when the value is out of range
   // (timeout 1..30 minutes, refresh flags 0 or 1).

@@ -203,11 +203,17 @@ void ProviderAgent::destruct() {
 
     DOZER_FreeLibrary();
     ClearMaps();
-    if (!m_bLoggerDefault) CLogger::instance().writeConfigDataFile();
+    // A data file the logger refused at start stays as the user wrote it.
+    if (!m_bLoggerDefault) CLogger::instance().dataFile().writeUnlessRejected();
+    // Saved here, while the sinks can still report a failure; the
+    // configuration's own save at its destruction then finds nothing to do.
+    m_ConfigFile.write();
 
     NRV_LOG(NRV_INFO, "Norvane Provider Unloaded");
     NRV_Runtime_Loader::unloadLibraries();
-    CLogger::instance().unregisterAll();
+    // The sinks die with the agent; what the logger allocated goes too, so
+    // a module unloaded now leaves nothing behind.
+    CLogger::instance().release();
   } catch (...) {
     NRV_LOG(NRV_ERR, "Error in ProviderAgent unload. Just continue");
   }

@@ -16,6 +16,9 @@
 // - The maps and m_pData are touched only under m_DataMutex.  The ready and
 //   busy flags change only under their own ready mutex (waiters re-test them
 //   in a loop, so a spurious wake never hands out a half-built catalogue).
+//   A waiter stops waiting, and reads the catalogue as it is, when no fetch
+//   is running: one that could not be started is retried by the next
+//   BuildCimpleInfo, never run on the caller's thread.
 // - The request flags (m_bBuild...), the configuration copies and m_bIsLoaded
 //   are atomics: they are set from request threads without a common lock.
 #pragma once
@@ -176,7 +179,9 @@ class ProviderAgent {
   Datetime m_LoadedTime;  // guarded by m_BuildMutex; zero interval until a fetch ends
   Thread m_DataFetchThread;  // started and joined under m_BuildMutex only
   std::mutex m_BuildMutex;
-  bool m_bIsDataFetchRunning = false;  // guarded by m_BuildMutex
+  // Changed under m_BuildMutex; waiting readers read it without (a reader
+  // never takes m_BuildMutex inside a ready lock).
+  std::atomic<bool> m_bIsDataFetchRunning{false};
   std::atomic<bool> m_bOwnComputerSystem{false};
 
  private:

@@ -1,23 +1,71 @@
 // The driver-log readers: the lines of the system log that name a driver,
 // newest first, into that driver's bounded holder.
-#include <fstream>
+#include <deque>
 #include <string>
-#include <vector>
+#include <string_view>
 
-#include "logging/NRV_SystemPaths.h"
 #include "agent/ProviderAgent.h"
 #include "logging/Log.h"
+#include "logging/NRV_RegularFile.h"
+#include "logging/NRV_SystemPaths.h"
 
 namespace cimple {
 
+namespace {
+
+// No syslog line is this long; a longer one is not kept.
+constexpr size_t kMaxLogLine = 64 << 10;
+
+// The newest `wanted` lines of `file` that contain `tag`, oldest first.  The
+// system log may be huge: only as many lines as the holder can still take
+// are ever kept, and the file is read in chunks.
+std::deque<std::string> newest_lines(Regular_File& file, std::string_view tag, size_t wanted) {
+  std::deque<std::string> kept;
+  if (wanted == 0) return kept;
+  std::string line;
+  bool overlong = false;
+  auto end_line = [&] {
+    if (!overlong && line.find(tag) != std::string::npos) {
+      kept.push_back(std::move(line));
+      if (kept.size() > wanted) kept.pop_front();
+    }
+    line.clear();
+    overlong = false;
+  };
+  char chunk[16 << 10];
+  for (long n; (n = file.read(chunk, sizeof chunk)) > 0;) {
+    std::string_view rest(chunk, static_cast<size_t>(n));
+    for (;;) {
+      const size_t feed = rest.find('\n');
+      const std::string_view piece = rest.substr(0, feed);
+      if (!overlong && line.size() + piece.size() <= kMaxLogLine)
+        line.append(piece);
+      else
+        overlong = true;
+      if (feed == std::string_view::npos) break;
+      end_line();
+      rest.remove_prefix(feed + 1);
+    }
+  }
+  if (!line.empty()) end_line();
+  return kept;
+}
+
+}  // namespace
+
 void ProviderAgent::readDriverEvents(const char* tag, DeviceLog& holder) {
   NRV_LOG(NRV_DBG, "Reading Events for %s", tag);
-  std::ifstream messages(system_path(kNrvSystemLogFile));
-  std::vector<std::string> kept;
-  for (std::string line; std::getline(messages, line);)
-    if (line.find(tag) != std::string::npos) kept.push_back(line);
-  for (auto it = kept.rbegin(); it != kept.rend(); ++it)
-    if (holder.add(*it) != 0) break;  // full
+  // Only a regular file: a FIFO in its place must not stall the caller,
+  // which holds m_DataMutex.
+  Regular_File messages = Regular_File::open(system_path(kNrvSystemLogFile));
+  if (messages.ok()) {
+    const size_t room = holder.size() < static_cast<size_t>(holder.maxCount())
+                            ? static_cast<size_t>(holder.maxCount()) - holder.size()
+                            : 0;
+    const std::deque<std::string> kept = newest_lines(messages, tag, room);
+    for (auto it = kept.rbegin(); it != kept.rend(); ++it)
+      if (holder.add(*it) != 0) break;  // full
+  }
   NRV_LOG(NRV_DBG, "Finished reading Events for %s", tag);
 }
 

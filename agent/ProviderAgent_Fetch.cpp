@@ -1,6 +1,7 @@
 // The data fetch: when one is due (BuildCimpleInfo, the cache-timeout check),
 // the fetch thread that rebuilds the adapter part and the SAN part of the
 // catalogue, and the waits of the reader contract.
+#include <chrono>
 #include <exception>
 
 #include "agent/ProviderAgent.h"
@@ -10,14 +11,21 @@ namespace cimple {
 
 namespace {
 
+// How long a waiting reader goes without looking whether a fetch is still
+// running: a fetch that could not be started broadcasts nothing.
+constexpr std::chrono::milliseconds kFetchRecheck{200};
+
 // Waits until `flag` holds, re-testing it after every wake-up: a wake-up
 // alone proves nothing (spurious wakes, broadcasts of an earlier state), and
-// a reader that went on would copy maps still being filled.
+// a reader that went on would copy maps still being filled.  When no fetch
+// is running there is nobody left to set the flag: the caller then goes on
+// with the catalogue as it is (nothing is filling it) instead of waiting for
+// ever.
 void wait_for(std::unique_lock<std::mutex>& lock, std::condition_variable& cond, const std::atomic<bool>& flag,
-              const char* waiting = nullptr, const char* woken = nullptr) {
+              const std::atomic<bool>& fetching, const char* waiting = nullptr, const char* woken = nullptr) {
   if (flag) return;
   if (waiting) NRV_LOG(NRV_DBG, "%s", waiting);
-  while (!flag) cond.wait(lock);
+  while (!flag && fetching) cond.wait_for(lock, kFetchRecheck);
   if (woken) NRV_LOG(NRV_DBG, "%s", woken);
 }
 
@@ -29,7 +37,7 @@ constexpr uint64_t kUsecPerMinute = 60000000ULL;
 
 std::unique_lock<std::mutex> ProviderAgent::waitForAdapterData(bool trace) {
   std::unique_lock<std::mutex> lock(m_AdapterDataReadyMutex);
-  wait_for(lock, m_AdapterDataReadyCond, m_bIsAdapterDataReady,
+  wait_for(lock, m_AdapterDataReadyCond, m_bIsAdapterDataReady, m_bIsDataFetchRunning,
            trace ? "PERF: Waiting for m_AdapterDataReadyMutex" : nullptr,
            trace ? "PERF: Woken up from wait for m_AdapterDataReadyMutex" : nullptr);
   return lock;
@@ -37,7 +45,7 @@ std::unique_lock<std::mutex> ProviderAgent::waitForAdapterData(bool trace) {
 
 std::unique_lock<std::mutex> ProviderAgent::waitForAdapterMaps(bool trace) {
   std::unique_lock<std::mutex> lock(m_AdapterMapsReadyMutex);
-  wait_for(lock, m_AdapterMapsReadyCond, m_bIsAdapterMapsReady,
+  wait_for(lock, m_AdapterMapsReadyCond, m_bIsAdapterMapsReady, m_bIsDataFetchRunning,
            trace ? "PERF: Waiting for m_AdapterMapsReadyMutex" : nullptr,
            trace ? "PERF: Woken up from wait for m_AdapterMapsReadyMutex" : nullptr);
   return lock;
@@ -45,7 +53,7 @@ std::unique_lock<std::mutex> ProviderAgent::waitForAdapterMaps(bool trace) {
 
 std::unique_lock<std::mutex> ProviderAgent::waitForSANMaps() {
   std::unique_lock<std::mutex> lock(m_SANMapsReadyMutex);
-  wait_for(lock, m_SANMapsReadyCond, m_bIsSANMapsReady);
+  wait_for(lock, m_SANMapsReadyCond, m_bIsSANMapsReady, m_bIsDataFetchRunning);
   return lock;
 }
 
@@ -94,10 +102,14 @@ int ProviderAgent::BuildCimpleInfo() {
   }
   // A timeout rebuilds the adapter part; a pending SAN request alone does not.
   if (!m_bBuildSANData) m_bBuildAdapterData = true;
-  const bool started = startDataFetch();
-  build.unlock();
-  // Without a thread the readers would wait for ever: fetch right here.
-  if (!started) runDataFetch();
+  if (!startDataFetch()) {
+    // Never fetched on this thread instead: the caller may be a method that
+    // holds m_DataMutex, which a fetch may only take after the ready locks.
+    // The request stays for the next call; readers stop waiting once they
+    // see that no fetch is running.
+    m_bIsDataFetchRunning = false;
+    return 0;
+  }
   NRV_LOG(NRV_DBG, "PERF: ---Created DataFetch_Handler thread -- BuildCimpleInfo END---");
   return 0;
 }
@@ -105,7 +117,7 @@ int ProviderAgent::BuildCimpleInfo() {
 // m_BuildMutex held, so the start and the joins of the thread never overlap.
 bool ProviderAgent::startDataFetch() {
   if (Thread::create_joinable(m_DataFetchThread, &ProviderAgent::DataFetch_Handler, this) == 0) return true;
-  NRV_LOG(NRV_ERR, "Unable to create DataFetch_Handler thread, fetching in the calling thread");
+  NRV_LOG(NRV_ERR, "Unable to create DataFetch_Handler thread; the catalogue is rebuilt at the next request");
   return false;
 }
 
@@ -193,14 +205,14 @@ void ProviderAgent::buildSANPart() {
     std::lock_guard<std::mutex> san_ready(m_SANMapsReadyMutex);
     m_bIsSANMapsReady = false;
   }
-  wait_for(data_ready, m_AdapterDataReadyCond, m_bIsAdapterDataReady);
+  wait_for(data_ready, m_AdapterDataReadyCond, m_bIsAdapterDataReady, m_bIsDataFetchRunning);
   if (m_bIsLoaded) {
     std::lock_guard<std::recursive_mutex> data(m_DataMutex);
     NRV_LOG(NRV_DBG, "PERF: Building SAN Data...");
     runStep(m_Builders.build_san_data, "buildSANData");
   }
   std::unique_lock<std::mutex> maps_ready(m_AdapterMapsReadyMutex);
-  wait_for(maps_ready, m_AdapterMapsReadyCond, m_bIsAdapterMapsReady);
+  wait_for(maps_ready, m_AdapterMapsReadyCond, m_bIsAdapterMapsReady, m_bIsDataFetchRunning);
   std::unique_lock<std::mutex> san_ready(m_SANMapsReadyMutex);
   m_bIsSANMapsUpdating = true;
   if (m_bIsLoaded) {

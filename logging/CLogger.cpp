@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <new>
 
 #include "logging/NRV_FileLogger.h"
 #include "logging/NRV_SysLogger.h"
@@ -33,8 +34,11 @@ std::string format_message(const char* format, va_list args) {
 CLogger::CLogger() : m_DataFile(*this) {}
 
 CLogger& CLogger::instance() {
-  // Leaked on purpose: modules and static destructors may log until the end.
-  static CLogger* const logger = new CLogger;
+  // Never destroyed: modules and static destructors may log until the end.
+  // Kept in the module's static storage rather than on the heap, so that a
+  // module unloaded after release() leaves nothing allocated behind.
+  alignas(CLogger) static unsigned char storage[sizeof(CLogger)];
+  static CLogger* const logger = new (storage) CLogger;
   return *logger;
 }
 
@@ -84,6 +88,15 @@ void CLogger::unregisterAll() {
   m_SysLogSink = nullptr;
 }
 
+void CLogger::release() {
+  {
+    std::lock_guard<std::mutex> lock(m_Mutex);
+    std::vector<NRV_LoggerInterface*>().swap(m_Sinks);
+    m_SysLogSink = nullptr;
+  }
+  m_DataFile.release();
+}
+
 size_t CLogger::sinkCount() const {
   std::lock_guard<std::mutex> lock(m_Mutex);
   return m_Sinks.size();
@@ -119,6 +132,7 @@ auto CLogger::withFileSink(Fn fn) const {
 }
 
 int CLogger::setTracePath(const std::string& path) {
+  if (path.size() > kNrvTracePathMax) return -1;
   const bool errorsOnly = isErrorsOnly();
   return withFileSink([&](NRV_FileLogger* file) {
     return file != nullptr ? file->open(path.c_str(), errorsOnly) : -1;

@@ -6,7 +6,9 @@
 // One logger mutex serialises the sink list and all sink output; a sink must
 // never log.  The settings (mode, level, enabled, errors-only) are atomic so
 // any thread may read them while the configuration paths change them.
-// instance() is never destroyed, so logging from static destructors is safe.
+// instance() is never destroyed, so logging from static destructors is safe;
+// it lives in static storage, and release() hands back what it allocated, so
+// a module unloaded by its CIMOM leaves no logger behind.
 #pragma once
 
 #include <atomic>
@@ -65,6 +67,10 @@ class CLogger {
   // Removes every occurrence; 1 when it was registered, else 0.
   int unregisterSink(NRV_LoggerInterface* sink);
   void unregisterAll();
+  // Unregisters every sink and frees the sink list and the data file's
+  // remembered path (computed again on next need).  For the last user of the
+  // module (the agent's destruction); the logger stays usable.
+  void release();
   size_t sinkCount() const;
 
   // Stores the mode, then starts every sink (non-zero) or stops it (0).
@@ -91,7 +97,8 @@ class CLogger {
   void clearAllLogs();
 
   // Opens `path` in the first registered file sink with the errors-only flag.
-  // 0 on success; -1 when it cannot be opened or no file sink is registered.
+  // 0 on success; -1 when it cannot be opened, is longer than the data file
+  // can carry (kNrvTracePathMax) or no file sink is registered.
   int setTracePath(const std::string& path);
   // The first file sink's path; empty when none is open or none is registered.
   std::string tracePath() const;
@@ -99,7 +106,7 @@ class CLogger {
   // The configuration data file ("dump file") of this logger.
   NRV_LogDataFile& dataFile() { return m_DataFile; }
   void readConfigDataFile() { m_DataFile.read(); }
-  void writeConfigDataFile() { m_DataFile.write(); }
+  bool writeConfigDataFile() { return m_DataFile.write(); }
   bool checkDumpFileAccess() { return m_DataFile.checkAccess(); }
 
  private:

@@ -3,13 +3,14 @@
 #include <unistd.h>
 
 #include <cerrno>
-#include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <memory>
 #include <optional>
+#include <string_view>
 #include <vector>
 
+#include "logging/NRV_FileRewrite.h"
+#include "logging/NRV_RegularFile.h"
 #include "logging/NRV_SystemPaths.h"
 #include "logging/CLogger.h"
 
@@ -17,14 +18,10 @@ namespace cimple {
 
 namespace {
 
-struct FileCloser {
-  void operator()(std::FILE* f) const { std::fclose(f); }
-};
-using File = std::unique_ptr<std::FILE, FileCloser>;
-
-// Longest first line ("mode,level,enabled") and trace path that are read.
-constexpr int kSettingsLineMax = 19;
-constexpr int kTracePathMax = 255;
+// Longest first line ("mode,level,enabled") that is read; more of it is
+// ignored.  Anything larger than a few lines is not this file.
+constexpr size_t kSettingsLineMax = 19;
+constexpr size_t kDataFileMax = 4096;
 
 // The comma-separated fields of the first line, in order.  A negative value
 // is always invalid; max < 0 means no upper bound.  A bounded field reports
@@ -49,14 +46,13 @@ std::optional<long long> field_value(const std::vector<std::string>& fields, siz
   return value;
 }
 
-std::vector<std::string> split_commas(const std::string& line) {
+std::vector<std::string> split_commas(std::string_view line) {
   std::vector<std::string> fields;
-  size_t start = 0;
   for (;;) {
-    size_t comma = line.find(',', start);
-    fields.push_back(line.substr(start, comma - start));
-    if (comma == std::string::npos) return fields;
-    start = comma + 1;
+    const size_t comma = line.find(',');
+    fields.emplace_back(line.substr(0, comma));
+    if (comma == std::string_view::npos) return fields;
+    line.remove_prefix(comma + 1);
   }
 }
 
@@ -64,16 +60,6 @@ std::vector<std::string> split_commas(const std::string& line) {
 void erase_last(std::string& text, char c) {
   size_t at = text.rfind(c);
   if (at != std::string::npos) text.erase(at, 1);
-}
-
-// Discards the rest of a line that did not fit the buffer, so the next read
-// starts on the following line.
-void skip_rest_of_line(std::FILE* f, const char* read) {
-  size_t n = std::strlen(read);
-  if (n > 0 && read[n - 1] == '\n') return;
-  int c;
-  while ((c = std::fgetc(f)) != EOF && c != '\n') {
-  }
 }
 
 }  // namespace
@@ -86,6 +72,14 @@ void NRV_LogDataFile::setReadOnlyRootProbe(ReadOnlyRootProbe probe) {
   std::lock_guard<std::mutex> lock(m_Mutex);
   m_ReadOnlyRoot = std::move(probe);
   m_bDumpPathKnown = false;
+}
+
+void NRV_LogDataFile::release() {
+  std::lock_guard<std::mutex> lock(m_Mutex);
+  m_ReadOnlyRoot = nullptr;
+  std::string().swap(m_DumpPath);
+  m_bDumpPathKnown = false;
+  m_bRejected = false;
 }
 
 std::string NRV_LogDataFile::computePath() {
@@ -104,16 +98,30 @@ std::string NRV_LogDataFile::path() {
   return pathLocked();
 }
 
-void NRV_LogDataFile::write() {
+bool NRV_LogDataFile::write() {
   std::lock_guard<std::mutex> lock(m_Mutex);
-  File f(std::fopen(pathLocked().c_str(), "w"));
-  if (!f) {
+  return writeLocked();
+}
+
+bool NRV_LogDataFile::writeLocked() {
+  const std::string content = std::to_string(m_Logger.getMode()) + "," + std::to_string(m_Logger.getLevel()) +
+                              "," + (m_Logger.isEnabled() ? "1" : "0") + "\n" + m_Logger.tracePath();
+  if (!rewrite_file(pathLocked(), content).ok()) {
     NRV_LOG_TO(m_Logger, NRV_ERR, "Unable to open dump file\n");
-    return;
+    return false;
   }
-  std::fprintf(f.get(), "%d,%d,%d\n", m_Logger.getMode(), m_Logger.getLevel(),
-               m_Logger.isEnabled() ? 1 : 0);
-  std::fputs(m_Logger.tracePath().c_str(), f.get());
+  m_bRejected = false;  // the file now holds what this module wrote
+  return true;
+}
+
+bool NRV_LogDataFile::writeUnlessRejected() {
+  std::lock_guard<std::mutex> lock(m_Mutex);
+  return m_bRejected || writeLocked();
+}
+
+bool NRV_LogDataFile::rejected() {
+  std::lock_guard<std::mutex> lock(m_Mutex);
+  return m_bRejected;
 }
 
 bool NRV_LogDataFile::checkAccessLocked() {
@@ -132,18 +140,23 @@ bool NRV_LogDataFile::checkAccess() {
 // file leaves the previous settings in force.
 void NRV_LogDataFile::read() {
   std::lock_guard<std::mutex> lock(m_Mutex);
+  m_bRejected = !readLocked();
+}
+
+bool NRV_LogDataFile::readLocked() {
   if (!checkAccessLocked()) computePath();
   const std::string path = m_DumpPath;
-  File f(std::fopen(path.c_str(), "r"));
-  if (!f) {
+  // A FIFO or a device here must not stall the provider load: only a
+  // regular file of a few lines is read.
+  const File_Text file = read_regular_file(path, kDataFileMax);
+  if (!file.ok()) {
     NRV_LOG_TO(m_Logger, NRV_ERR, "Unable to open config data file - %s", path.c_str());
-    return;
+    return file.status == File_Status::Missing;
   }
 
-  char line[kTracePathMax + 1];
-  if (std::fgets(line, kSettingsLineMax + 1, f.get()) == nullptr) return;
-  skip_rest_of_line(f.get(), line);
-  const std::vector<std::string> fields = split_commas(line);
+  const std::vector<std::string_view> lines = split_lines(file.text);
+  if (lines.empty()) return true;  // an empty file holds nothing to keep
+  const std::vector<std::string> fields = split_commas(lines[0].substr(0, kSettingsLineMax));
 
   long long values[kSettingCount];
   for (size_t i = 0; i < kSettingCount; ++i) {
@@ -152,7 +165,7 @@ void NRV_LogDataFile::read() {
     if (!value) {
       NRV_LOG_TO(m_Logger, NRV_ERR, "Unable to read Log %s from config data file - %s",
                  field.name, path.c_str());
-      return;
+      return false;
     }
     if (*value < 0 || (field.max >= 0 && *value > field.max)) {
       if (field.max >= 0)
@@ -161,7 +174,7 @@ void NRV_LogDataFile::read() {
       else
         NRV_LOG_TO(m_Logger, NRV_ERR, "Invalid value for Log %s from config data file - %s",
                    field.name, path.c_str());
-      return;
+      return false;
     }
     values[i] = *value;
   }
@@ -169,16 +182,21 @@ void NRV_LogDataFile::read() {
 
   const auto log_mode = static_cast<int32_t>(mode);
   if (nrv_mode_writes_file(log_mode)) {
-    if (std::fgets(line, kTracePathMax + 1, f.get()) == nullptr) return;
-    std::string trace_path = line;
+    if (lines.size() < 2) return false;
+    std::string trace_path(lines[1]);
     erase_last(trace_path, '\r');
-    erase_last(trace_path, '\n');
-    if (m_Logger.setTracePath(trace_path) != 0) return;
+    // A cut path would name some other file: a path that does not fit is refused.
+    if (trace_path.size() > kNrvTracePathMax) {
+      NRV_LOG_TO(m_Logger, NRV_ERR, "Trace path too long in config data file - %s", path.c_str());
+      return false;
+    }
+    if (m_Logger.setTracePath(trace_path) != 0) return false;
   }
 
   m_Logger.setEnabledValue(enabled > 0 ? 1 : 0);
   if (level > 0 && level != m_Logger.getLevel()) m_Logger.setLevel(static_cast<int32_t>(level));
   m_Logger.setMode(log_mode);
+  return true;
 }
 
 bool NRV_LogDataFile::applyDefaultIfMissing() {

@@ -4,9 +4,13 @@
 //
 // Contract: belongs to one CLogger, which must outlive it.  Every problem is
 // reported through that logger and leaves the previous settings in force.
+// Only a regular file is read, and only its first few kilobytes; a write
+// replaces the file whole or not at all.  A file whose content was refused
+// stays as the user left it until the settings are explicitly saved.
 // Must not be used while the logger mutex is held (it logs).
 #pragma once
 
+#include <cstddef>
 #include <functional>
 #include <mutex>
 #include <string>
@@ -21,6 +25,9 @@ inline constexpr const char* kNrvReadOnlyRootDumpFile = "/var/log/norvane_tavo_p
 // The fault-data trace file used when no configuration data file exists.
 inline constexpr const char* kNrvFaultDataFile =
     "/opt/kelvar/platform/log/norvane_tavo_provider_ffdc.log";
+
+// Longest trace path the file carries; a longer one is refused, never cut.
+inline constexpr size_t kNrvTracePathMax = 255;
 
 // The fault-data file as it must be opened now (relocated under the sysroot).
 std::string nrv_fault_data_file();
@@ -41,12 +48,23 @@ class NRV_LogDataFile {
   // The file's path, computed on first need and then kept.
   std::string path();
 
-  // Writes "mode,level,enabled\n" followed by the trace path (no newline).
-  void write();
+  // Writes "mode,level,enabled\n" followed by the trace path (no newline),
+  // unless the file already holds exactly that.  False (logged) when the
+  // file could not be replaced.
+  bool write();
+  // The save at unload: like write(), but a file whose content read() refused
+  // is left alone (true then).
+  bool writeUnlessRejected();
+  // read() found a file and refused what it holds.
+  bool rejected();
   // False (and logs the system error at NRV_CRIT) when the file is not readable.
   bool checkAccess();
   // Reads the file and applies what it holds; see the .cpp for the steps.
   void read();
+
+  // Forgets the path and the read-only probe (which may point into an
+  // unloaded module) and frees what they held.
+  void release();
 
   // Start-up fallback: when the file is not readable, switches the logger to
   // errors-only file logging on the fault-data file and answers true.
@@ -56,12 +74,16 @@ class NRV_LogDataFile {
   std::string computePath();
   std::string pathLocked();
   bool checkAccessLocked();
+  // False when an existing file was refused.
+  bool readLocked();
+  bool writeLocked();
 
   CLogger& m_Logger;
   std::mutex m_Mutex;  // guards the fields below and serialises read/write
   ReadOnlyRootProbe m_ReadOnlyRoot;
   bool m_bDumpPathKnown = false;
   std::string m_DumpPath;
+  bool m_bRejected = false;
 };
 
 }  // namespace cimple

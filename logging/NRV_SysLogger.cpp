@@ -9,14 +9,16 @@ namespace cimple {
 
 namespace {
 
-// Indexed by level; -1 marks levels that never reach the system log.
+// Indexed by level; -1 marks levels that never reach the system log.  The
+// driver-log readers scan the system log, and every catalogue read logs at
+// NRV_INFO: only problems belong there.
 constexpr int kPriorities[kNrvLevelCount] = {
     -1,           // NRV_INVALID
     LOG_CRIT,     // NRV_CRIT
     LOG_WARNING,  // NRV_WARN
     LOG_ERR,      // NRV_ERR
-    LOG_INFO,     // NRV_INFO
-    -1,           // NRV_DBG: too chatty for the system log
+    -1,           // NRV_INFO
+    -1,           // NRV_DBG
 };
 
 }  // namespace

@@ -1,6 +1,6 @@
-// Syslog sink of the provider logger: passes critical, warning, error and
-// informational messages to the system log under "[NRV][CIM][TAVO]".  It is
-// the only sink that still hears the module while logging is disabled.
+// Syslog sink of the provider logger: passes critical, warning and error
+// messages to the system log under "[NRV][CIM][TAVO]".  It is the only sink
+// that still hears the module while logging is disabled.
 //
 // Contract: registers itself with the logger and opens the system log when
 // constructed; unregisters and closes it when destroyed.  The logger passed in
@@ -27,7 +27,7 @@ class NRV_SysLogger : public NRV_LoggerInterface {
   void clear() override {}
 
   // The syslog priority for a level, or -1 for a level that is not passed on
-  // (NRV_INVALID, NRV_DBG and anything outside the defined levels).
+  // (NRV_INVALID, NRV_INFO, NRV_DBG and anything outside the defined levels).
   static int priorityFor(int level);
 
  private:

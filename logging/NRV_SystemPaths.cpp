@@ -5,7 +5,9 @@
 namespace cimple {
 
 std::string system_path(const char* fixed_path) {
-  const char* root = std::getenv(kSysrootVariable);
+  // Ignored in a set-user-ID or capability-raised process, where whoever
+  // started it must not redirect the module's files.
+  const char* root = secure_getenv(kSysrootVariable);
   if (root == nullptr || *root == '\0') return fixed_path;
   std::string path(root);
   while (!path.empty() && path.back() == '/') path.pop_back();

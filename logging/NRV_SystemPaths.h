@@ -1,7 +1,8 @@
 // Where the module's fixed system files really are.  Every fixed path
 // ("/etc/...", "/var/log/...", "/opt/...") goes through system_path(), which
 // prefixes it with $NRV_SYSROOT when that variable is set, so tests and the
-// demo never touch the real system files.
+// demo never touch the real system files.  A process running with raised
+// privileges (set-user-ID, file capabilities) ignores the variable.
 #pragma once
 
 #include <string>

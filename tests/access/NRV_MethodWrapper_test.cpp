@@ -15,6 +15,7 @@
 
 #include "TestSupport.h"
 #include "access/NRV_Runtime_Loader.h"
+#include "tests/common/Special_Files.h"
 
 using namespace cimple;
 using nrv_test::LogCapture;
@@ -57,6 +58,9 @@ TEST(MethodWrapper, SecondWrapperWaitsForTheFirst) {
 }
 TEST(MethodWrapper, FailedInitialisationThrows) {
   EXPECT_EQ(0, runInChild("WrapperChild.DISABLED_InitFails", stubPath()));
+}
+TEST(MethodWrapper, AStaleSemaphoreOfAnEarlierProcessDoesNotBlock) {
+  EXPECT_EQ(0, runInChild("WrapperChild.DISABLED_StaleSemaphore", stubPath()));
 }
 TEST(MethodWrapper, AdapterTests) {
   EXPECT_EQ(0, runInChild("WrapperChild.DISABLED_AdapterTests", stubPath()));
@@ -131,6 +135,31 @@ TEST(WrapperChild, DISABLED_InitFails) {
   *result = 0;
   { NRV_MethodWrapper wrapper; }
   dlclose(h);
+  NRV_Runtime_Loader::unloadLibraries();
+}
+
+// An earlier process with this process's id died inside the initialisation
+// (value 1) or while a second wrapper waited (value 0).
+TEST(WrapperChild, DISABLED_StaleSemaphore) {
+  ASSERT_EQ(0, NRV_Runtime_Loader::loadLibraries());
+  auto initCalls = stubFunction<int (*)()>("stub_init_calls");
+  ASSERT_NE(nullptr, initCalls);
+  int expected_calls = 0;
+  for (unsigned stale_value : {0u, 1u}) {
+    SCOPED_TRACE(stale_value);
+    sem_t* stale = sem_open(NRV_MethodWrapper::initSemaphoreName().c_str(), O_CREAT, 0644, stale_value);
+    ASSERT_NE(SEM_FAILED, stale);
+    sem_close(stale);
+    LogCapture log;
+    {
+      nrv_test::Hang_Guard guard("a wrapper over a stale semaphore");
+      NRV_MethodWrapper wrapper;
+    }
+    EXPECT_EQ(++expected_calls, initCalls());
+    EXPECT_EQ(1, log.count("Removed stale semaphore " + NRV_MethodWrapper::initSemaphoreName(), NRV_WARN));
+    EXPECT_TRUE(log.contains("RM Library initialized"));
+    EXPECT_FALSE(semaphoreExists(NRV_MethodWrapper::initSemaphoreName()));
+  }
   NRV_Runtime_Loader::unloadLibraries();
 }
 

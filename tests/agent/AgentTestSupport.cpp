@@ -114,6 +114,13 @@ void Gate::open() {
   m_Cond.notify_all();
 }
 
+void Gate::reset() {
+  std::lock_guard<std::mutex> lock(m_Mutex);
+  m_Open = true;
+  m_Arrived = 0;
+  m_Cond.notify_all();
+}
+
 void Gate::pass() {
   std::unique_lock<std::mutex> lock(m_Mutex);
   ++m_Arrived;
@@ -197,8 +204,8 @@ void FakeCatalogue::reset() {
   adapterDataBuilds = adapterMapUpdates = sanDataBuilds = sanMapUpdates = generation = 0;
   chips = 6;
   disks = 4;
-  adapterDataGate.open();
-  sanDataGate.open();
+  adapterDataGate.reset();
+  sanDataGate.reset();
 }
 
 Catalogue_Builders FakeCatalogue::builders() {

@@ -60,6 +60,8 @@ class Gate {
  public:
   void close();
   void open();
+  // Open, and no arrivals counted: each test counts its own.
+  void reset();
   void pass();
   // Blocks until `n` callers have arrived at the gate in total.
   void await_arrivals(int n);

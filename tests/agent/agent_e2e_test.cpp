@@ -2,6 +2,7 @@
 // requests through its command-line client, the simulated site behind it.
 #include <gtest/gtest.h>
 
+#include <cstdio>
 #include <cstdlib>
 #include <sstream>
 #include <string>
@@ -52,9 +53,24 @@ TEST(AgentEndToEnd, ProviderSettingsAreReadAndModifiedThroughCMPI) {
   Reply san = cim({"mi", kSanRefresh, "current=2"});
   EXPECT_EQ(san.status, 1);
   EXPECT_NE(san.err.find("CMPI_RC_ERR_INVALID_PARAMETER"), std::string::npos) << san.err;
-  // The accepted value reached the file when the module let its agent go.
+  // The accepted value reached the file.
   EXPECT_NE(read_file(sysroot_path(cimple::kNrvConfigFile)).find("NRV_PROVIDER_CACHE_TIMEOUT = 3\n"),
             std::string::npos);
+}
+
+TEST(AgentEndToEnd, AChangeThatCannotBeSavedFailsAndTheOldValueStays) {
+  const std::string config = sysroot_path(cimple::kNrvConfigFile);
+  const std::string moved = sysroot() + "/etc-moved";
+  const std::string etc = config.substr(0, config.rfind('/'));
+  remove_file(config);
+  ASSERT_EQ(::rename(etc.c_str(), moved.c_str()), 0);  // the configuration's folder is gone
+  Reply changed = cim({"mi", kTimeout, "current=7"});
+  Reply one = cim({"gi", kTimeout});
+  ASSERT_EQ(::rename(moved.c_str(), etc.c_str()), 0);
+  EXPECT_EQ(changed.status, 1);
+  EXPECT_NE(changed.err.find("CMPI_RC_ERR_FAILED"), std::string::npos) << changed.err;
+  ASSERT_EQ(one.status, 0) << one.err;
+  EXPECT_NE(one.out.find("current = 10;"), std::string::npos) << one.out;
 }
 
 }  // namespace

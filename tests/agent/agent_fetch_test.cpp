@@ -1,6 +1,9 @@
 // When the agent fetches and what a fetch rebuilds: the first read, the
 // cache timeout measured from the end of the last fetch, SAN requests, the
 // refresh settings, the clearing groups and the driver-log readers.
+#include <sys/resource.h>
+
+#include <fstream>
 #include <set>
 #include <string>
 #include <thread>
@@ -10,6 +13,7 @@
 #include "agent/Catalogue_Maps.h"
 #include "agent/Catalogue_Provider.h"
 #include "schema/Classes.h"
+#include "tests/common/Special_Files.h"
 
 namespace nrv_test {
 namespace {
@@ -244,6 +248,39 @@ TEST_F(FetchTest, DriverLogsKeepTheNewestLinesOfTheirDriverUpTo200) {
   remove_file(sysroot_path(kNrvSystemLogFile));
   agent.logISCSIDriverEvents();  // no system log: nothing added, no failure
   EXPECT_TRUE(agent.m_ISCSIDriverLog.lines().empty());
+  for (const Special_Case& c : kSpecialFiles) {
+    ASSERT_TRUE(make_special(sysroot_path(kNrvSystemLogFile), c.kind));
+    Hang_Guard guard(std::string("reading a system log that is a ") + c.name);
+    agent.logISCSIDriverEvents();
+    EXPECT_TRUE(agent.m_ISCSIDriverLog.lines().empty()) << c.name;
+  }
+  ::rmdir(sysroot_path(kNrvSystemLogFile).c_str());
+  remove_file(sysroot_path(kNrvSystemLogFile));
+}
+
+// Run in a child, whose peak memory use is its own.
+TEST_F(FetchTest, DISABLED_ChildAHugeSystemLogIsReadInLittleMemory) {
+  ProviderAgent& agent = start();
+  const int lines = 200000;  // some 32 MiB, every line the FC driver's
+  {
+    std::ofstream out(sysroot_path(kNrvSystemLogFile), std::ios::binary | std::ios::trunc);
+    const std::string filler(120, '.');
+    for (int i = 0; i < lines; ++i) out << "Dec  6 kernel: nvfc " << filler << " line " << i << "\n";
+  }
+  struct rusage before {};
+  ::getrusage(RUSAGE_SELF, &before);
+  agent.logFCDriverEvents();
+  struct rusage after {};
+  ::getrusage(RUSAGE_SELF, &after);
+  const auto fc = agent.m_FCDriverLog.lines();
+  ASSERT_EQ(fc.size(), 200u);
+  EXPECT_NE(fc.front().find(" line " + std::to_string(lines - 1)), std::string::npos);
+  EXPECT_LT(after.ru_maxrss - before.ru_maxrss, 16 * 1024) << "KiB more at the peak";
+  remove_file(sysroot_path(kNrvSystemLogFile));
+}
+
+TEST(DriverLogMemory, AHugeSystemLogIsReadInLittleMemory) {
+  EXPECT_EQ(run_in_child("FetchTest.DISABLED_ChildAHugeSystemLogIsReadInLittleMemory", NRV_AGENT_STUB_DIR), 0);
 }
 
 }  // namespace

@@ -12,6 +12,7 @@
 #include "logging/Log.h"
 #include "schema/NRVTAVO_Chip.h"
 #include "schema/NRVTAVO_LogicalDisk.h"
+#include "tests/common/Special_Files.h"
 
 namespace nrv_test {
 namespace {
@@ -148,6 +149,37 @@ TEST_F(LifecycleTest, UnloadingWhileAFetchRunsWaitsForIt) {
   EXPECT_GT(ended, built);
   EXPECT_GT(capture.find("Deleting Data pointer"), ended);
   EXPECT_EQ(ProviderAgent::peekInstance(), nullptr);
+}
+
+// Neither file may stall the load, which holds the agent mutex that every
+// other provider load waits for.
+TEST_F(LifecycleTest, SpecialFilesInPlaceOfTheSettingsLeaveTheDefaultsAndAreLeftAlone) {
+  const std::string config = sysroot_path(cimple::kNrvConfigFile);
+  const std::string dump = sysroot_path(cimple::kNrvDumpFile);
+  for (const Special_Case& c : kSpecialFiles) {
+    SCOPED_TRACE(c.name);
+    ASSERT_TRUE(make_special(config, c.kind));
+    ASSERT_TRUE(make_special(dump, c.kind));
+    capture.arm();
+    capture.reset();
+    auto chip = make_slot<Catalogue_Provider<NRVTAVO_Chip>, NRVTAVO_Chip>();
+    {
+      Hang_Guard guard(std::string("a provider load over settings files that are a ") + c.name);
+      ASSERT_EQ(chip->load(), cimple::LOAD_OK);
+      ProviderAgent* agent = ProviderAgent::peekInstance();
+      EXPECT_EQ(agent->m_CacheTimeout, 10);
+      EXPECT_TRUE(agent->m_bRefreshSANData);
+      EXPECT_EQ(chip->unload(), cimple::UNLOAD_OK);
+    }
+    EXPECT_EQ(capture.count("Unable to open provider config setting file - " + config, cimple::NRV_ERR), 1);
+    EXPECT_EQ(capture.count("Unable to open config data file - " + dump, cimple::NRV_ERR), 1);
+    EXPECT_TRUE(is_special(config, c.kind));
+    EXPECT_TRUE(is_special(dump, c.kind));
+  }
+  for (const std::string& path : {config, dump}) {
+    ::rmdir(path.c_str());
+    remove_file(path);
+  }
 }
 
 // ---- construction failures, each in a child process of its own ------------------

@@ -9,6 +9,7 @@
 #include "AgentTestSupport.h"
 #include "agent/NrvConfigFile.h"
 #include "logging/Log.h"
+#include "tests/common/Special_Files.h"
 
 namespace nrv_test {
 namespace {
@@ -94,25 +95,45 @@ TEST_F(ConfigFileTest, CommentsBlanksAndGarbageAreSkipped) {
   EXPECT_TRUE(s.refreshSANData);
 }
 
-TEST_F(ConfigFileTest, LongLinesAreReadInPiecesAndOnlyTheFirstThousandLinesCount) {
-  // The key lands at the start of the second 1023-character piece.
-  EXPECT_EQ(read_text(std::string(1023, 'x') + "NRV_PROVIDER_CACHE_TIMEOUT = 9\n").cacheTimeout, 9);
+TEST_F(ConfigFileTest, ALongCommentIsNoSettingAndKeysPastTheThousandthLineCount) {
+  const std::string key = "NRV_PROVIDER_CACHE_TIMEOUT = 9";
+  // Read in 1023-character pieces, the tail of these lines would be a setting.
+  EXPECT_EQ(read_text("# " + std::string(1021, 'x') + key + "\n").cacheTimeout, 10);
+  EXPECT_EQ(read_text(std::string(1023, 'x') + key + "\n").cacheTimeout, 10);
+  EXPECT_EQ(read_text(key + std::string(1023 - key.size(), ' ') + "\n").cacheTimeout, 9);
   std::string many;
   for (int i = 0; i < 1000; ++i) many += "# filler\n";
-  EXPECT_EQ(read_text(many + "NRV_PROVIDER_CACHE_TIMEOUT = 9\n").cacheTimeout, 10);
+  EXPECT_EQ(read_text(many + key + "\n").cacheTimeout, 9);
 }
 
-TEST_F(ConfigFileTest, AnUnreadableFileIsLoggedAndKeepsTheDefaults) {
-  // A directory at the path cannot be read as a file.
-  ASSERT_EQ(::mkdir(path.c_str(), 0755), 0);
-  {
-    NrvConfigFile config;
-    config.read(path);
-    expect_defaults(config.settings());
-  }  // the rewrite fails silently too
+TEST_F(ConfigFileTest, ASpecialFileAtEitherPathIsRefusedWithoutBlockingAndLeftAlone) {
+  const std::string weblaunch = sysroot_path(cimple::kNrvWebLaunchFile);
+  for (const Special_Case& c : kSpecialFiles) {
+    SCOPED_TRACE(c.name);
+    capture.reset();
+    ASSERT_TRUE(make_special(path, c.kind));
+    ASSERT_TRUE(make_special(weblaunch, c.kind));
+    {
+      Hang_Guard guard(std::string("reading settings from a ") + c.name);
+      NrvConfigFile config;
+      config.read(path);
+      expect_defaults(config.settings());
+      EXPECT_FALSE(config.write());
+      EXPECT_EQ(NrvConfigFile::readWebLaunchAddress(), "");
+    }  // nor does the save of the destructor replace it
+    EXPECT_EQ(capture.count("Unable to open provider config setting file - " + path, cimple::NRV_ERR), 1);
+    EXPECT_EQ(capture.count("Unable to write provider config setting file - " + path + ": not a regular file",
+                            cimple::NRV_ERR),
+              2);
+    EXPECT_EQ(capture.count("Unable to read WebLaunch config file '" + weblaunch + "': not a regular file",
+                            cimple::NRV_ERR),
+              1);
+    EXPECT_TRUE(is_special(path, c.kind));
+    EXPECT_TRUE(is_special(weblaunch, c.kind));
+  }
+  remove_file(weblaunch);
   ::rmdir(path.c_str());
-  const int opened = capture.count("Unable to open provider config setting file - " + path, cimple::NRV_ERR);
-  EXPECT_LE(opened, 1);  // fopen of a directory may succeed and read nothing
+  remove_file(path);
 }
 
 TEST_F(ConfigFileTest, SettersCheckTheirBounds) {
@@ -131,7 +152,7 @@ TEST_F(ConfigFileTest, SettersCheckTheirBounds) {
   EXPECT_EQ(config.getCacheTimeout(), 30);
 }
 
-TEST_F(ConfigFileTest, TheDestructorRewritesTheFileInSixLines) {
+TEST_F(ConfigFileTest, TheDestructorRewritesTheFileInSixLinesUnlessItHoldsThemAlready) {
   write_file(path, "NRV_PROVIDER_CACHE_TIMEOUT = 3\nsomething else\n");
   {
     NrvConfigFile config;
@@ -147,22 +168,34 @@ TEST_F(ConfigFileTest, TheDestructorRewritesTheFileInSixLines) {
             "NRV_PROVIDER_CACHE_TIMEOUT = 3\n"
             "NRV_PROVIDER_REFRESH_ADAPTERDATA = TRUE\n"
             "NRV_PROVIDER_REFRESH_SANDATA = TRUE\n");
-  // What is written reads back the same.
+  // What is written reads back the same, and is then left alone.
+  struct stat before {};
+  ASSERT_EQ(::stat(path.c_str(), &before), 0);
   const auto s = read_text(written);
   EXPECT_EQ(s.cacheTimeout, 3);
   EXPECT_TRUE(s.refreshAdapterData);
   EXPECT_TRUE(s.refreshSANData);
+  struct stat after {};
+  ASSERT_EQ(::stat(path.c_str(), &after), 0);
+  EXPECT_EQ(before.st_ino, after.st_ino);
 }
 
-TEST_F(ConfigFileTest, AnUnwritablePathIsSkippedSilently) {
+TEST_F(ConfigFileTest, AMissingDirectoryIsAClearErrorAndKeepsTheOldValue) {
   const std::string missing_dir = sysroot_path("/no/such/dir/provider.conf");
   {
     NrvConfigFile config;
     config.read(missing_dir);
-    EXPECT_EQ(config.setCacheTimeout(15), 0);
+    EXPECT_EQ(config.change(&NrvConfigFile::setCacheTimeout, 15), NrvConfigFile::Change::NotSaved);
+    EXPECT_EQ(config.getCacheTimeout(), 10);
+    EXPECT_EQ(config.change(&NrvConfigFile::setCacheTimeout, 45), NrvConfigFile::Change::OutOfRange);
   }
-  EXPECT_TRUE(capture.entries().empty());
+  EXPECT_EQ(capture.count("Unable to write provider config setting file - " + missing_dir + ": missing directory",
+                          cimple::NRV_ERR),
+            2);  // the change, then the destructor's save
+  capture.reset();
   NrvConfigFile unread;  // never read: no path, nothing written
+  EXPECT_TRUE(unread.write());
+  EXPECT_TRUE(capture.entries().empty());
 }
 
 TEST_F(ConfigFileTest, WebLaunchIsTheFirstLineThatIsNotBlankOrAComment) {

@@ -1,6 +1,8 @@
 // NRVTAVO_ProviderConfigSetting through its provider procedure: the three
 // published settings, and modifications that reach the agent at once and the
 // configuration file when the agent ends.
+#include <sys/resource.h>
+
 #include <type_traits>
 
 #include "AgentFixture.h"
@@ -118,7 +120,17 @@ TEST_F(ConfigSettingTest, GetInstanceFindsASettingByItsKey) {
   unref(keys);
 }
 
-TEST_F(ConfigSettingTest, AModificationTakesEffectAtOnceAndReachesTheFileAtTheEnd) {
+const char* const kSavedSettings =
+    "##################################################\n"
+    "# Norvane HBA CIM Provider Configuration Settings #\n"
+    "##################################################\n"
+    "NRV_PROVIDER_CACHE_TIMEOUT = 3\n"
+    "NRV_PROVIDER_REFRESH_ADAPTERDATA = TRUE\n"
+    "NRV_PROVIDER_REFRESH_SANDATA = FALSE\n";
+
+// A CIMOM may never bring the agent's count to zero (SFCB cleans up once per
+// MI type): a change is saved when it is made.
+TEST_F(ConfigSettingTest, AModificationTakesEffectAndReachesTheFileAtOnce) {
   load();
   EXPECT_EQ(modify("cachetimeout", 3), MODIFY_INSTANCE_OK);  // below the published low range, inside the setter's
   EXPECT_EQ(capture.count("Cache time-out is modified successfully", NRV_WARN), 1);
@@ -132,20 +144,39 @@ TEST_F(ConfigSettingTest, AModificationTakesEffectAtOnceAndReachesTheFileAtTheEn
   EXPECT_EQ(capture.count("SAN refresh is modified successfully", NRV_WARN), 1);
   EXPECT_FALSE(agent->m_bRefreshSANData);
   EXPECT_EQ(currents(), (std::vector<uint32_t>{3, 1, 0}));
+  EXPECT_EQ(read_file(sysroot_path(kNrvConfigFile)), kSavedSettings);
 
-  EXPECT_EQ(read_file(sysroot_path(kNrvConfigFile)), "");  // not before the agent ends
   unload();
-  EXPECT_EQ(read_file(sysroot_path(kNrvConfigFile)),
-            "##################################################\n"
-            "# Norvane HBA CIM Provider Configuration Settings #\n"
-            "##################################################\n"
-            "NRV_PROVIDER_CACHE_TIMEOUT = 3\n"
-            "NRV_PROVIDER_REFRESH_ADAPTERDATA = TRUE\n"
-            "NRV_PROVIDER_REFRESH_SANDATA = FALSE\n");
+  EXPECT_EQ(read_file(sysroot_path(kNrvConfigFile)), kSavedSettings);
   // And the next agent starts from them.
   capture.arm();
   load();
   EXPECT_EQ(currents(), (std::vector<uint32_t>{3, 1, 0}));
+}
+
+// Run in a child: the file-size limit there makes every write of the
+// settings fail, as a full disk or a competing limit would.
+TEST_F(ConfigSettingTest, DISABLED_ChildAChangeThatCannotBeSavedFailsAndChangesNothing) {
+  const std::string original = "NRV_PROVIDER_CACHE_TIMEOUT = 20\n";
+  write_file(sysroot_path(kNrvDumpFile), "1,5,1\n");  // record log only: no trace file to grow
+  load(original);
+  const struct rlimit tiny = {8, 8};
+  ASSERT_EQ(::setrlimit(RLIMIT_FSIZE, &tiny), 0);
+  capture.reset();
+  EXPECT_EQ(modify("cachetimeout", 25), MODIFY_INSTANCE_FAILED);
+  EXPECT_EQ(capture.count("Cache time-out is modified successfully"), 0);
+  EXPECT_EQ(agent->m_CacheTimeout, 20);
+  EXPECT_EQ(agent->m_ConfigFile.getCacheTimeout(), 20);
+  EXPECT_EQ(currents(), (std::vector<uint32_t>{20, 0, 1}));
+  // The rewrite at unload fails the same way and leaves the file whole.
+  unload();
+  EXPECT_EQ(read_file(sysroot_path(kNrvConfigFile)), original);
+}
+
+TEST(ConfigSettingFailure, AChangeThatCannotBeSavedFailsAndChangesNothing) {
+  EXPECT_EQ(run_in_child("ConfigSettingTest.DISABLED_ChildAChangeThatCannotBeSavedFailsAndChangesNothing",
+                         NRV_AGENT_STUB_DIR),
+            0);
 }
 
 TEST_F(ConfigSettingTest, OutOfRangeValuesAreRefusedAndChangeNothing) {

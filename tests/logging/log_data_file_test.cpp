@@ -1,5 +1,8 @@
 // The logger's configuration data file: where it lives, what is written, how
 // every malformed first line is reported, and the fault-data fallback.
+#include <sys/stat.h>
+
+#include <algorithm>
 #include <filesystem>
 #include <string>
 
@@ -9,6 +12,7 @@
 #include "logging/NRV_CIMLogger.h"
 #include "logging/NRV_FileLogger.h"
 #include "LogTestSupport.h"
+#include "tests/common/Special_Files.h"
 
 namespace cimple {
 namespace {
@@ -233,6 +237,89 @@ TEST_F(LogDataFileTest, MissingFileIsReportedTwice) {
   EXPECT_EQ("File access failed with No such file or directory", onlyMessageAt(NRV_CRIT));
   EXPECT_EQ("Unable to open config data file - " + dump, onlyMessageAt(NRV_ERR));
   EXPECT_FALSE(h.logger.checkDumpFileAccess());
+}
+
+TEST_F(LogDataFileTest, ASpecialFileAtThePathIsRefusedWithoutBlockingAndLeftAlone) {
+  for (const nrv_test::Special_Case& c : nrv_test::kSpecialFiles) {
+    SCOPED_TRACE(c.name);
+    Harness fresh;
+    ASSERT_TRUE(nrv_test::make_special(dump, c.kind));
+    fresh.logger.setMode(NRV_MODE_RECORDS);
+    fresh.logger.setLevel(NRV_WARN);
+    {
+      nrv_test::Hang_Guard guard(std::string("reading a data file that is a ") + c.name);
+      fresh.logger.readConfigDataFile();
+      EXPECT_TRUE(fresh.logger.dataFile().writeUnlessRejected());  // the save at unload
+      EXPECT_FALSE(fresh.logger.writeConfigDataFile());           // an explicit save
+    }
+    const auto messages = fresh.capture.messages();
+    EXPECT_EQ(1, std::count(messages.begin(), messages.end(), "Unable to open config data file - " + dump));
+    EXPECT_TRUE(fresh.logger.dataFile().rejected());
+    EXPECT_EQ(NRV_MODE_RECORDS, fresh.logger.getMode());
+    EXPECT_EQ(NRV_WARN, fresh.logger.getLevel());
+    EXPECT_TRUE(nrv_test::is_special(dump, c.kind));
+  }
+  std::filesystem::remove_all(dump);
+}
+
+TEST_F(LogDataFileTest, ARefusedFileIsLeftAsItWasByTheSaveAtUnload) {
+  // Cut to the buffer, this path would name a file of its own.
+  const std::string dir = root.under("/var/log/");
+  const std::string long_trace = dir + std::string(300 - dir.size(), 'x');
+  struct Case {
+    std::string content;
+    std::string message;  // the complaint at NRV_ERR, if any
+  };
+  const Case cases[] = {
+      {"7,1,1\n" + trace, "Invalid value for Log Mode from config data file -" + dump + "-7"},
+      {"1,x,1\n", "Unable to read Log Level from config data file - " + dump},
+      {"2,5,1\n", ""},
+      {"2,5,1\n" + long_trace + "\n", "Trace path too long in config data file - " + dump},
+  };
+  for (const Case& c : cases) {
+    SCOPED_TRACE(c.content);
+    Harness fresh;
+    write_text(dump, c.content);
+    fresh.logger.readConfigDataFile();
+    EXPECT_TRUE(fresh.logger.dataFile().rejected());
+    EXPECT_TRUE(fresh.logger.dataFile().writeUnlessRejected());
+    EXPECT_EQ(c.content, read_text(dump));
+    std::vector<std::string> errors;
+    for (const auto& e : fresh.capture.entries())
+      if (e.level == NRV_ERR) errors.push_back(e.message);
+    EXPECT_EQ(c.message.empty() ? std::vector<std::string>{} : std::vector<std::string>{c.message}, errors);
+  }
+  EXPECT_FALSE(std::filesystem::exists(long_trace.substr(0, kNrvTracePathMax)));
+
+  // An explicit save replaces a refused file, and the save at unload follows it.
+  write_text(dump, "7,1,1\n");
+  h.logger.readConfigDataFile();
+  h.logger.setMode(NRV_MODE_RECORDS);
+  EXPECT_TRUE(h.logger.writeConfigDataFile());
+  EXPECT_FALSE(h.logger.dataFile().rejected());
+  EXPECT_EQ("1,0,0\n", read_text(dump));
+}
+
+TEST_F(LogDataFileTest, ATracePathLongerThanTheFileCarriesIsRefused) {
+  const std::string dir = root.under("/var/log/");
+  const std::string fits = dir + std::string(kNrvTracePathMax - dir.size(), 'f');
+  const std::string too_long = fits + "g";
+  EXPECT_EQ(-1, h.logger.setTracePath(too_long));
+  EXPECT_FALSE(std::filesystem::exists(too_long));
+  EXPECT_EQ(0, h.logger.setTracePath(fits));
+  EXPECT_EQ(fits, h.logger.tracePath());
+}
+
+TEST_F(LogDataFileTest, AnUnchangedFileIsNotRewritten) {
+  write_text(dump, "1,3,1\n");
+  h.logger.readConfigDataFile();
+  struct stat before {};
+  ASSERT_EQ(0, ::stat(dump.c_str(), &before));
+  EXPECT_TRUE(h.logger.writeConfigDataFile());
+  struct stat after {};
+  ASSERT_EQ(0, ::stat(dump.c_str(), &after));
+  EXPECT_EQ(before.st_ino, after.st_ino);
+  EXPECT_EQ("1,3,1\n", read_text(dump));
 }
 
 // --- fault-data fallback -------------------------------------------------
