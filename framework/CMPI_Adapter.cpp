@@ -181,6 +181,20 @@ CMPI_Call::~CMPI_Call() {
   Thread_Context::pop();
 }
 
+CMPIStatus CMPI_Call::finish_result(int result, Result_Table defined) {
+  CMPIrc rc = CMPI_RC_ERR_FAILED;
+  for (const Result_Map& entry : defined)
+    if (entry.result == result) rc = entry.rc;
+  if (rc != CMPI_RC_ERR_FAILED) return finish(rc);
+  const Provider_Registration* registration = adapter_ ? adapter_->handle().registration() : nullptr;
+  char message[256];
+  std::snprintf(message, sizeof(message), "%s: %s failed (provider result %d)",
+                registration && registration->provider_name ? registration->provider_name : "provider", function_,
+                result);
+  CIMPLE_WARN("%s", message);
+  return finish(rc, message);
+}
+
 CMPIStatus CMPI_Call::finish(CMPIrc rc, const char* message) {
   CIMPLE_DBG("return: %s(): %s", function_, cmpi_rc_name(rc));
   CMPIStatus status{rc, nullptr};
