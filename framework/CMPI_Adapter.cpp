@@ -79,14 +79,15 @@ CMPI_Adapter::CMPI_Adapter(CMPI_Static_Data* record, const Provider_Registration
     : record_(record), handle_(registration), broker_(broker) {
   handle_.create_provider();
   unload_allowed_ = true;
+  // Known before load(): its up-calls convert what the CIMOM answers by it.
+  meta_class_ = handle_.meta_class();
+  repository_ = handle_.repository();
   CMPI_Thread_Context thread_context(broker, context, this);
   Thread_Context::push(&thread_context);
   CIMPLE_DBG("enter: %s()", "CMPI_Adapter");
   fill_tables(provider_name);
   load_count_ = 1;
   handle_.load();
-  meta_class_ = handle_.meta_class();
-  repository_ = handle_.repository();
   CIMPLE_DBG("return: %s()", "CMPI_Adapter");
   Thread_Context::pop();
 }
