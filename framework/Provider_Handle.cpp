@@ -45,7 +45,7 @@ bool pass_references(Instance* association, int, void* data) {
   const Meta_Class* mc = association->meta_class;
   for (size_t i = 0; i < mc->num_meta_features; ++i) {
     const Meta_Feature* mf = mc->meta_features[i];
-    if (!(mf->flags & FLAG_REFERENCE)) continue;
+    if (!(mf->flags & FLAG_REFERENCE) || is_embedded(mf)) continue;
     auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
     if (is_reference_array(mr) || (name_given(walk->role) && !equal_nocase(mr->name, walk->role))) continue;
     if (refers_to(association, mr, walk->source)) return walk->proc(association, 0, walk->data);
@@ -77,7 +77,7 @@ bool pass_associators(Instance* association, int, void* data) {
   std::vector<const Meta_Reference*> far_ends;
   for (size_t i = 0; i < mc->num_meta_features; ++i) {
     const Meta_Feature* mf = mc->meta_features[i];
-    if (!(mf->flags & FLAG_REFERENCE)) continue;
+    if (!(mf->flags & FLAG_REFERENCE) || is_embedded(mf)) continue;
     auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
     if (is_reference_array(mr)) continue;
     if (!has_source && refers_to(association, mr, walk->source)) {
