@@ -142,9 +142,16 @@ void ProviderAgent::construct() {
     }
 
     NRV_LOG(NRV_DBG, "Initializing RM API ");
-    if (NRV_Runtime_Loader::loadLibraries() == 1) NRV_LOG(NRV_ERR, "Error : In Loading Library ");
-
-    m_pMethodWrapper = std::make_unique<NRV_MethodWrapper>();
+    if (NRV_Runtime_Loader::loadLibraries() == 1) {
+      // Without a management library there is nothing to initialise, and the
+      // agent still serves what needs none (the provider settings) while
+      // adapter classes answer empty, so that a CIMOM's request across every
+      // provider still succeeds.
+      NRV_LOG(NRV_ERR, "Error : In Loading Library ");
+      NRV_LOG(NRV_CRIT, "No management library (liblrmapi.so, librmapi.so) found: no adapter can be managed");
+    } else {
+      m_pMethodWrapper = std::make_unique<NRV_MethodWrapper>();
+    }
     m_pData = std::make_unique<Data>();
 
     NRV_LOG(NRV_INFO, "Norvane Provider v%d.%d.%d-%d Loaded[%d]", kNrvVersion[0], kNrvVersion[1], kNrvVersion[2],

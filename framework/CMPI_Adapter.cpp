@@ -79,14 +79,15 @@ CMPI_Adapter::CMPI_Adapter(CMPI_Static_Data* record, const Provider_Registration
     : record_(record), handle_(registration), broker_(broker) {
   handle_.create_provider();
   unload_allowed_ = true;
+  // Known before load(): its up-calls convert what the CIMOM answers by it.
+  meta_class_ = handle_.meta_class();
+  repository_ = handle_.repository();
   CMPI_Thread_Context thread_context(broker, context, this);
   Thread_Context::push(&thread_context);
   CIMPLE_DBG("enter: %s()", "CMPI_Adapter");
   fill_tables(provider_name);
   load_count_ = 1;
   handle_.load();
-  meta_class_ = handle_.meta_class();
-  repository_ = handle_.repository();
   CIMPLE_DBG("return: %s()", "CMPI_Adapter");
   Thread_Context::pop();
 }
@@ -179,6 +180,20 @@ CMPI_Call::~CMPI_Call() {
   if (adapter_ == nullptr) return;
   adapter_->mutex().unlock();
   Thread_Context::pop();
+}
+
+CMPIStatus CMPI_Call::finish_result(int result, Result_Table defined) {
+  CMPIrc rc = CMPI_RC_ERR_FAILED;
+  for (const Result_Map& entry : defined)
+    if (entry.result == result) rc = entry.rc;
+  if (rc != CMPI_RC_ERR_FAILED) return finish(rc);
+  const Provider_Registration* registration = adapter_ ? adapter_->handle().registration() : nullptr;
+  char message[256];
+  std::snprintf(message, sizeof(message), "%s: %s failed (provider result %d)",
+                registration && registration->provider_name ? registration->provider_name : "provider", function_,
+                result);
+  CIMPLE_WARN("%s", message);
+  return finish(rc, message);
 }
 
 CMPIStatus CMPI_Call::finish(CMPIrc rc, const char* message) {

@@ -13,6 +13,7 @@
 #include <map>
 #include <memory>
 #include <optional>
+#include <span>
 #include <string>
 
 #include "cmpimacs.h"
@@ -76,6 +77,13 @@ class CMPI_Adapter {
 // "CMPI_RC_OK", "CMPI_RC_ERR_FAILED", ...; "CMPI_RC_ERROR" for unknown codes.
 const char* cmpi_rc_name(CMPIrc rc);
 
+// One provider result an operation defines, and what it tells the CIMOM.
+struct Result_Map {
+  int result;
+  CMPIrc rc;
+};
+using Result_Table = std::span<const Result_Map>;
+
 // The frame of one CMPI call: the thread context is pushed and the adapter
 // locked for the frame's life; finish() traces the return and builds the
 // status.  adapter() is null when the MI object has no live adapter.
@@ -90,6 +98,11 @@ class CMPI_Call {
   const CMPIBroker* broker() const { return adapter_ ? adapter_->broker() : nullptr; }
   const CMPIContext* context() const { return cmpi_context_; }
   CMPIStatus finish(CMPIrc rc, const char* message = nullptr);
+  // The answer to a provider's result.  `defined` lists every result the
+  // operation defines, its success included; anything else (-1 from a
+  // provider that threw or ran nothing, a code of another operation) is a
+  // failure, never a success.  A failure names the provider and the result.
+  CMPIStatus finish_result(int result, Result_Table defined);
 
  private:
   const char* function_;

@@ -27,19 +27,16 @@ CMPIStatus association_cleanup(CMPIAssociationMI* mi, const CMPIContext* ctx, CM
   return CMPI_Adapter::cleanup(mi ? static_cast<CMPI_Static_Data*>(mi->hdl) : nullptr, ctx, terminating, "cleanup");
 }
 
-CMPIrc map_associator_names(int result) {
-  return map_result(result, {{ENUM_ASSOCIATOR_NAMES_FAILED, CMPI_RC_ERR_FAILED},
-                             {ENUM_ASSOCIATOR_NAMES_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
-                             {ENUM_ASSOCIATOR_NAMES_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
-                    CMPI_RC_OK);
-}
-
-CMPIrc map_references(int result) {
-  return map_result(result, {{ENUM_REFERENCES_FAILED, CMPI_RC_ERR_FAILED},
-                             {ENUM_REFERENCES_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
-                             {ENUM_REFERENCES_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
-                    CMPI_RC_OK);
-}
+// The results each operation defines; any other result is a failure.
+constexpr Result_Map kAssociatorNamesResults[] = {
+    {ENUM_ASSOCIATOR_NAMES_OK, CMPI_RC_OK},
+    {ENUM_ASSOCIATOR_NAMES_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
+    {ENUM_ASSOCIATOR_NAMES_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}};
+constexpr Result_Map kAssociatorsResults[] = {{ENUM_ASSOCIATORS_OK, CMPI_RC_OK},
+                                              {ENUM_ASSOCIATORS_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}};
+constexpr Result_Map kReferencesResults[] = {{ENUM_REFERENCES_OK, CMPI_RC_OK},
+                                             {ENUM_REFERENCES_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
+                                             {ENUM_REFERENCES_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}};
 
 CMPIStatus associator_names(CMPIAssociationMI* mi, const CMPIContext* ctx, const CMPIResult* rslt,
                             const CMPIObjectPath* path, const char*, const char* result_class, const char* role,
@@ -55,7 +52,7 @@ CMPIStatus associator_names(CMPIAssociationMI* mi, const CMPIContext* ctx, const
     delivery.own_name_space = true;
     int result = call.adapter()->handle().enum_associator_names(source.get(), given(result_class), given(role),
                                                                 given(result_role), deliver_object_path, &delivery);
-    return call.finish(map_associator_names(result));
+    return call.finish_result(result, kAssociatorNamesResults);
   });
 }
 
@@ -74,21 +71,14 @@ CMPIStatus associators(CMPIAssociationMI* mi, const CMPIContext* ctx, const CMPI
     delivery.own_name_space = true;
     int result = handle.enum_associators(source.get(), given(result_class), given(role), given(result_role),
                                          deliver_instance, &delivery);
-    if (result != ENUM_ASSOCIATORS_UNSUPPORTED)
-      return call.finish(map_result(result, {{0, CMPI_RC_OK},
-                                             {ENUM_ASSOCIATORS_FAILED, CMPI_RC_ERR_FAILED},
-                                             {ENUM_ASSOCIATORS_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
-                                    CMPI_RC_ERR_FAILED));
+    if (result != ENUM_ASSOCIATORS_UNSUPPORTED) return call.finish_result(result, kAssociatorsResults);
     // The provider knows only the far ends' keys: fetch each whole object
     // from the CIMOM, which routes to the far end's own provider.
     CMPI_Delivery fetch{call.broker(), ctx, rslt, ns.c_str(), properties};
     fetch.own_name_space = true;
     result = handle.enum_associator_names(source.get(), given(result_class), given(role), given(result_role),
                                           deliver_fetched_instance, &fetch);
-    return call.finish(map_result(result, {{0, CMPI_RC_OK},
-                                           {ENUM_ASSOCIATOR_NAMES_FAILED, CMPI_RC_ERR_FAILED},
-                                           {ENUM_ASSOCIATOR_NAMES_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
-                                  CMPI_RC_ERR_NOT_SUPPORTED));
+    return call.finish_result(result, kAssociatorNamesResults);
   });
 }
 
@@ -113,7 +103,7 @@ CMPIStatus reference_names(CMPIAssociationMI* mi, const CMPIContext* ctx, const 
     CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), nullptr};
     int result = call.adapter()->handle().enum_references(source.get(), model.get(), given(role), deliver_object_path,
                                                           &delivery);
-    return call.finish(map_references(result));
+    return call.finish_result(result, kReferencesResults);
   });
 }
 
@@ -131,7 +121,7 @@ CMPIStatus references(CMPIAssociationMI* mi, const CMPIContext* ctx, const CMPIR
     delivery.apply_list = true;
     int result =
         call.adapter()->handle().enum_references(source.get(), model.get(), given(role), deliver_instance, &delivery);
-    return call.finish(map_references(result));
+    return call.finish_result(result, kReferencesResults);
   });
 }
 

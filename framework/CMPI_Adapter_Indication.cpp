@@ -11,6 +11,11 @@ namespace {
 
 const CMPIStatus kNoAdapter{CMPI_RC_ERR_FAILED, nullptr};
 
+// Only a provider that produces indications answers 0; the module's answer
+// -1 (no producer) is a failure like any result these tables lack.
+constexpr Result_Map kEnableResults[] = {{ENABLE_INDICATIONS_OK, CMPI_RC_OK}};
+constexpr Result_Map kDisableResults[] = {{DISABLE_INDICATIONS_OK, CMPI_RC_OK}};
+
 // Called by a provider for each indication (which it hands over): delivers
 // it to every name space with an active filter.
 bool deliver_indication(Instance* indication, void* data) {
@@ -72,7 +77,7 @@ CMPIStatus enable_indications(CMPIIndicationMI* mi, const CMPIContext* ctx) {
     using Indication_Proc = bool (*)(Instance*, void*);
     Indication_Proc proc = deliver_indication;
     int result = call.adapter()->handle().enable_indications(reinterpret_cast<void*>(proc), call.adapter());
-    return call.finish(result == ENABLE_INDICATIONS_FAILED ? CMPI_RC_ERR_FAILED : CMPI_RC_OK);
+    return call.finish_result(result, kEnableResults);
   });
 }
 
@@ -81,7 +86,7 @@ CMPIStatus disable_indications(CMPIIndicationMI* mi, const CMPIContext* ctx) {
   if (!call.adapter()) return kNoAdapter;
   return run(call, [&]() -> CMPIStatus {
     int result = call.adapter()->handle().disable_indications();
-    return call.finish(result == DISABLE_INDICATIONS_FAILED ? CMPI_RC_ERR_FAILED : CMPI_RC_OK);
+    return call.finish_result(result, kDisableResults);
   });
 }
 

@@ -8,6 +8,32 @@ namespace {
 
 const CMPIStatus kNoAdapter{CMPI_RC_ERR_FAILED, nullptr};
 
+// The results each operation defines; any other result is a failure.
+constexpr Result_Map kEnumResults[] = {{ENUM_INSTANCES_OK, CMPI_RC_OK},
+                                       {ENUM_INSTANCES_FAILED, CMPI_RC_ERR_FAILED},
+                                       {ENUM_INSTANCES_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}};
+constexpr Result_Map kGetResults[] = {{GET_INSTANCE_OK, CMPI_RC_OK},
+                                      {GET_INSTANCE_NOT_FOUND, CMPI_RC_ERR_NOT_FOUND},
+                                      {GET_INSTANCE_INVALID_PARAMETER, CMPI_RC_ERR_INVALID_PARAMETER},
+                                      {GET_INSTANCE_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}};
+constexpr Result_Map kCreateResults[] = {{CREATE_INSTANCE_OK, CMPI_RC_OK},
+                                         {CREATE_INSTANCE_DUPLICATE, CMPI_RC_ERR_ALREADY_EXISTS},
+                                         {CREATE_INSTANCE_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
+                                         {CREATE_INSTANCE_INVALID_PARAMETER, CMPI_RC_ERR_INVALID_PARAMETER},
+                                         {CREATE_INSTANCE_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}};
+constexpr Result_Map kModifyResults[] = {{MODIFY_INSTANCE_OK, CMPI_RC_OK},
+                                         {MODIFY_INSTANCE_NOT_FOUND, CMPI_RC_ERR_NOT_FOUND},
+                                         {MODIFY_INSTANCE_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
+                                         {MODIFY_INSTANCE_INVALID_PARAMETER, CMPI_RC_ERR_INVALID_PARAMETER},
+                                         {MODIFY_INSTANCE_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}};
+constexpr Result_Map kDeleteResults[] = {{DELETE_INSTANCE_OK, CMPI_RC_OK},
+                                         {DELETE_INSTANCE_NOT_FOUND, CMPI_RC_ERR_NOT_FOUND},
+                                         {DELETE_INSTANCE_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
+                                         {DELETE_INSTANCE_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}};
+constexpr Result_Map kInvokeResults[] = {{INVOKE_METHOD_OK, CMPI_RC_OK},
+                                         {INVOKE_METHOD_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
+                                         {INVOKE_METHOD_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}};
+
 CMPI_Env env_of(const CMPI_Call& call, const std::string& name_space) {
   return CMPI_Env{call.broker(), call.adapter()->repository(), name_space.c_str()};
 }
@@ -48,10 +74,8 @@ CMPIStatus enum_instance_names(CMPIInstanceMI* mi, const CMPIContext* ctx, const
     set_null_flags(model.get(), false, true, 1);
     CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), nullptr};
     int result = call.adapter()->handle().enum_instances(model.get(), deliver_object_path, &delivery);
-    if (result == 0) CMReturnDone(rslt);
-    return call.finish(map_result(result, {{ENUM_INSTANCES_FAILED, CMPI_RC_ERR_FAILED},
-                                           {ENUM_INSTANCES_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
-                                  CMPI_RC_OK));
+    if (result == ENUM_INSTANCES_OK) CMReturnDone(rslt);
+    return call.finish_result(result, kEnumResults);
   });
 }
 
@@ -65,11 +89,8 @@ CMPIStatus enum_instances(CMPIInstanceMI* mi, const CMPIContext* ctx, const CMPI
     if (CMPIrc rc = read_model(call, path, ns, rslt, properties, model); rc != CMPI_RC_OK) return call.finish(rc);
     CMPI_Delivery delivery{call.broker(), ctx, rslt, ns.c_str(), properties};
     int result = call.adapter()->handle().enum_instances(model.get(), deliver_instance, &delivery);
-    CMPIrc rc = map_result(result, {{ENUM_INSTANCES_FAILED, CMPI_RC_ERR_FAILED},
-                                    {ENUM_INSTANCES_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
-                           CMPI_RC_OK);
-    if (rc == CMPI_RC_OK) CMReturnDone(rslt);
-    return call.finish(rc);
+    if (result == ENUM_INSTANCES_OK) CMReturnDone(rslt);
+    return call.finish_result(result, kEnumResults);
   });
 }
 
@@ -84,11 +105,8 @@ CMPIStatus get_instance(CMPIInstanceMI* mi, const CMPIContext* ctx, const CMPIRe
     Instance* found = nullptr;
     int result = call.adapter()->handle().get_instance(model.get(), found);
     Instance_Ptr instance(found);
-    if (result != 0 || !instance)
-      return call.finish(map_result(result, {{GET_INSTANCE_NOT_FOUND, CMPI_RC_ERR_NOT_FOUND},
-                                             {GET_INSTANCE_INVALID_PARAMETER, CMPI_RC_ERR_INVALID_PARAMETER},
-                                             {GET_INSTANCE_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
-                                    CMPI_RC_ERR_FAILED));
+    if (result == GET_INSTANCE_OK && !instance) result = -1;  // a success without an instance answers nothing
+    if (result != GET_INSTANCE_OK) return call.finish_result(result, kGetResults);
     CMPI_Ptr<CMPIObjectPath> out_path;
     CMPI_Ptr<CMPIInstance> out;
     CMPIrc rc = make_cmpi_object_path(call.broker(), instance.get(), ns.c_str(), out_path);
@@ -123,12 +141,7 @@ CMPIStatus create_instance(CMPIInstanceMI* mi, const CMPIContext* ctx, const CMP
       CMReturnDone(rslt);
       return call.finish(CMPI_RC_OK);
     }
-    return call.finish(map_result(result, {{CREATE_INSTANCE_DUPLICATE, CMPI_RC_ERR_ALREADY_EXISTS},
-                                           {CREATE_INSTANCE_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
-                                           {CREATE_INSTANCE_INVALID_PARAMETER, CMPI_RC_ERR_INVALID_PARAMETER},
-                                           {CREATE_INSTANCE_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED},
-                                           {CREATE_INSTANCE_FAILED, CMPI_RC_ERR_FAILED}},
-                                  CMPI_RC_OK));
+    return call.finish_result(result, kCreateResults);
   });
 }
 
@@ -158,12 +171,7 @@ CMPIStatus modify_instance(CMPIInstanceMI* mi, const CMPIContext* ctx, const CMP
       CMReturnDone(rslt);
       return call.finish(CMPI_RC_OK);
     }
-    return call.finish(map_result(result, {{MODIFY_INSTANCE_NOT_FOUND, CMPI_RC_ERR_NOT_FOUND},
-                                           {MODIFY_INSTANCE_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
-                                           {MODIFY_INSTANCE_INVALID_PARAMETER, CMPI_RC_ERR_INVALID_PARAMETER},
-                                           {MODIFY_INSTANCE_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED},
-                                           {MODIFY_INSTANCE_FAILED, CMPI_RC_ERR_FAILED}},
-                                  CMPI_RC_OK));
+    return call.finish_result(result, kModifyResults);
   });
 }
 
@@ -180,10 +188,7 @@ CMPIStatus delete_instance(CMPIInstanceMI* mi, const CMPIContext* ctx, const CMP
       if (rslt) CMReturnDone(rslt);
       return call.finish(CMPI_RC_OK);
     }
-    return call.finish(map_result(result, {{DELETE_INSTANCE_NOT_FOUND, CMPI_RC_ERR_NOT_FOUND},
-                                           {DELETE_INSTANCE_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
-                                           {DELETE_INSTANCE_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
-                                  CMPI_RC_ERR_FAILED));
+    return call.finish_result(result, kDeleteResults);
   });
 }
 
@@ -216,15 +221,10 @@ CMPIStatus invoke_method(CMPIMethodMI* mi, const CMPIContext* ctx, const CMPIRes
     rc = make_cimple_method(env, mm, path, in, converted);
     Instance_Ptr record(converted);
     if (rc != CMPI_RC_OK) return call.finish(rc, "CIMPLE make_cimple_method function failed");
-    int result = call.adapter()->handle().invoke_method(model.get(), record.get());
     // -1: the provider ran no method (none matched, or it threw); a zero
     // return value must not be reported for a method that never ran.
-    if (result == -1) return call.finish(CMPI_RC_ERR_FAILED, method);
-    rc = map_result(result, {{INVOKE_METHOD_FAILED, CMPI_RC_ERR_FAILED},
-                             {INVOKE_METHOD_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
-                             {INVOKE_METHOD_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}},
-                    CMPI_RC_OK);
-    if (rc != CMPI_RC_OK) return call.finish(rc);
+    int result = call.adapter()->handle().invoke_method(model.get(), record.get());
+    if (result != INVOKE_METHOD_OK) return call.finish_result(result, kInvokeResults);
     CMPI_Ptr<CMPIArgs> scratch;
     if (out == nullptr) {
       scratch.reset(CMNewArgs(call.broker(), nullptr));

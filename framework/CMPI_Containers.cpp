@@ -20,6 +20,11 @@ namespace {
 
 size_t count_or_zero(CMPICount count, const CMPIStatus& rc) { return rc.rc == CMPI_RC_OK ? count : 0; }
 
+bool is_empty_instance_array(const Value& value) {
+  const Array<Instance*>* elements = value.get<Array<Instance*>>();
+  return elements != nullptr && elements->size() == 0;
+}
+
 }  // namespace
 
 size_t CMPIObjectPath_Container::get_size() {
@@ -45,9 +50,9 @@ int CMPIObjectPath_Container::get_value(size_t pos, int type, const Meta_Feature
   return cmpi_to_value(env_, feature ? feature->name : "", data, type, feature, value);
 }
 
-int CMPIObjectPath_Container::set_value(const char* name, const Value& value, uint32_t) {
+int CMPIObjectPath_Container::set_value(const char* name, const Value& value, uint32_t flags) {
   CMPI_Out_Value out;
-  if (value_to_cmpi(env_, value, out) != 0) {
+  if (value_to_cmpi(env_, value, out, flags) != 0) {
     CIMPLE_WARN("_to_cmpi_data() failed: feature=%s", name);
     return -1;
   }
@@ -81,9 +86,15 @@ int CMPIInstance_Container::get_value(size_t pos, int type, const Meta_Feature* 
   return cmpi_to_value(env_, feature ? feature->name : "", data, type, feature, value);
 }
 
-int CMPIInstance_Container::set_value(const char* name, const Value& value, uint32_t) {
+int CMPIInstance_Container::set_value(const char* name, const Value& value, uint32_t flags) {
+  // An empty embedded array is how an instance says "none" (its slot has no
+  // null flag), so the property stays unset, that is null.  SFCB refuses
+  // every array value of an EmbeddedObject property with
+  // CMPI_RC_ERR_TYPE_MISMATCH, and the explicit null it accepts goes out in a
+  // form Debian's wbemcli cannot parse; an unset property goes out empty.
+  if ((flags & (FLAG_EMBEDDED_INSTANCE | FLAG_EMBEDDED_OBJECT)) && is_empty_instance_array(value)) return 0;
   CMPI_Out_Value out;
-  if (value_to_cmpi(env_, value, out) != 0) {
+  if (value_to_cmpi(env_, value, out, flags) != 0) {
     CIMPLE_WARN("_to_cmpi_data() failed: feature=%s", name);
     return -1;
   }
@@ -134,9 +145,9 @@ int CMPIArgs_Container::get_value(size_t pos, int type, const Meta_Feature* feat
   return cmpi_to_value(env_, name, data, type, feature, value);
 }
 
-int CMPIArgs_Container::set_value(const char* name, const Value& value, uint32_t) {
+int CMPIArgs_Container::set_value(const char* name, const Value& value, uint32_t flags) {
   CMPI_Out_Value out;
-  if (value_to_cmpi(env_, value, out) != 0) {
+  if (value_to_cmpi(env_, value, out, flags) != 0) {
     CIMPLE_WARN("_to_cmpi_data() failed: feature=%s", name);
     return -1;
   }

@@ -276,8 +276,27 @@ int cmpi_to_value(const CMPI_Env& env, const char* name, const CMPIData& data, i
 
 namespace {
 
+// An instance as the object path that names it, or as a whole CMPI
+// instance when it is embedded.
+int instance_to_cmpi(const CMPI_Env& env, const Instance* item, bool embedded, CMPI_Out_Value& out) {
+  if (item == nullptr) return -1;
+  const char* ns = item->__name_space.empty() ? env.name_space : item->__name_space.c_str();
+  CMPI_Ptr<CMPIObjectPath> path;
+  if (make_cmpi_object_path(env.broker, item, ns, path) != CMPI_RC_OK) return -1;
+  if (!embedded) {
+    out.value.ref = path.release();
+    out.type = CMPI_ref;
+    return 0;
+  }
+  CMPI_Ptr<CMPIInstance> instance;
+  if (make_cmpi_instance(env.broker, item, ns, path.get(), nullptr, instance) != CMPI_RC_OK) return -1;
+  out.value.inst = instance.release();
+  out.type = CMPI_instance;
+  return 0;
+}
+
 template <class T>
-int element_to_cmpi(const CMPI_Env& env, const T& item, CMPI_Out_Value& out) {
+int element_to_cmpi(const CMPI_Env& env, const T& item, bool embedded, CMPI_Out_Value& out) {
   CMPIStatus rc{CMPI_RC_OK, nullptr};
   if constexpr (std::is_same_v<T, String>) {
     out.value.string = CMNewString(env.broker, item.c_str(), &rc);
@@ -288,13 +307,7 @@ int element_to_cmpi(const CMPI_Env& env, const T& item, CMPI_Out_Value& out) {
     out.type = CMPI_dateTime;
     return out.value.dateTime ? 0 : -1;
   } else if constexpr (std::is_same_v<T, Instance*>) {
-    if (item == nullptr) return -1;
-    const char* ns = item->__name_space.empty() ? env.name_space : item->__name_space.c_str();
-    CMPI_Ptr<CMPIObjectPath> path;
-    if (make_cmpi_object_path(env.broker, item, ns, path) != CMPI_RC_OK) return -1;
-    out.value.ref = path.release();
-    out.type = CMPI_ref;
-    return 0;
+    return instance_to_cmpi(env, item, embedded, out);
   } else {
     to_union(out.value, item);
     out.type = kCmpiType[scalar_code<T>()];
@@ -304,7 +317,7 @@ int element_to_cmpi(const CMPI_Env& env, const T& item, CMPI_Out_Value& out) {
 
 }  // namespace
 
-int value_to_cmpi(const CMPI_Env& env, const Value& value, CMPI_Out_Value& out) {
+int value_to_cmpi(const CMPI_Env& env, const Value& value, CMPI_Out_Value& out, uint32_t flags) {
   out.reset();
   if (value.is_null() || value.type() == Value::NONE) {
     CIMPLE_WARN("unexpected type");
@@ -315,30 +328,32 @@ int value_to_cmpi(const CMPI_Env& env, const Value& value, CMPI_Out_Value& out) 
     CIMPLE_WARN("unexpected type");
     return -1;
   }
+  const bool embedded = (flags & (FLAG_EMBEDDED_INSTANCE | FLAG_EMBEDDED_OBJECT)) != 0;
+  const CMPIType element_type = code == Value::INSTANCE && embedded ? CMPIType(CMPI_instance) : kCmpiType[code];
   return visit_code(code, [&](auto tag) -> int {
     using T = typename decltype(tag)::type;
     if (!value.is_array()) {
       if constexpr (std::is_same_v<T, Instance*>) {
-        return element_to_cmpi<Instance*>(env, value.instance(), out);
+        return element_to_cmpi<Instance*>(env, value.instance(), embedded, out);
       } else {
-        return element_to_cmpi(env, *value.get<T>(), out);
+        return element_to_cmpi(env, *value.get<T>(), embedded, out);
       }
     }
     const Array<T>& elements = *value.get<Array<T>>();
     CMPIStatus rc{CMPI_RC_OK, nullptr};
-    CMPIArray* array = CMNewArray(env.broker, static_cast<CMPICount>(elements.size()), kCmpiType[code], &rc);
+    CMPIArray* array = CMNewArray(env.broker, static_cast<CMPICount>(elements.size()), element_type, &rc);
     if (array == nullptr) {
       CIMPLE_WARN("conversion error");
       return -1;
     }
     out.value.array = array;
-    out.type = static_cast<CMPIType>(kCmpiType[code] | CMPI_ARRAY);
+    out.type = static_cast<CMPIType>(element_type | CMPI_ARRAY);
     for (size_t i = 0; i < elements.size(); ++i) {
       if constexpr (std::is_same_v<T, Instance*>) {
         if (elements[i] == nullptr) continue;  // stays a null element
       }
       CMPI_Out_Value element;
-      if (element_to_cmpi(env, elements[i], element) != 0) {
+      if (element_to_cmpi(env, elements[i], embedded, element) != 0) {
         CIMPLE_WARN("element conversion failed");
         continue;
       }

@@ -1,6 +1,7 @@
 // Single values between CMPI data and cimple::Value: the scalar, string,
-// datetime, reference and array conversions every CMPI container shares,
-// and the reading of text sent for numeric or boolean method parameters.
+// datetime, reference, embedded instance and array conversions every CMPI
+// container shares, and the reading of text sent for numeric or boolean
+// method parameters.
 //
 // Contract: never throws into the CIMOM; a failure is logged to the trace
 // file and answered -1.  Values built for the CIMOM are owned by the
@@ -16,9 +17,10 @@ namespace cimple {
 // messages; `feature` (may be null) gives the class of references.
 int cmpi_to_value(const CMPI_Env& env, const char* name, const CMPIData& data, int type,
                   const Meta_Feature* feature, Value& value);
-// Value -> CMPI value owned by `out`.  References become object paths in
-// their own name space, or `env.name_space` when they have none.
-int value_to_cmpi(const CMPI_Env& env, const Value& value, CMPI_Out_Value& out);
+// Value -> CMPI value owned by `out`.  Instances become object paths, or
+// CMPI instances when `flags` (the feature's) mark them embedded, in their
+// own name space, or `env.name_space` when they have none.
+int value_to_cmpi(const CMPI_Env& env, const Value& value, CMPI_Out_Value& out, uint32_t flags = 0);
 
 // The text of a CMPI string or chars datum.
 int cmpi_text(const CMPIData& data, String& out);

@@ -66,12 +66,6 @@ bool deliver_fetched_instance(Instance* instance, int, void* data) {
   return true;
 }
 
-CMPIrc map_result(int result, std::initializer_list<Result_Map> table, CMPIrc otherwise) {
-  for (const Result_Map& entry : table)
-    if (entry.result == result) return entry.rc;
-  return otherwise;
-}
-
 std::string name_space_of(const CMPIObjectPath* path) {
   if (path == nullptr) return {};
   CMPIStatus rc{CMPI_RC_OK, nullptr};

@@ -1,7 +1,6 @@
 // How the CMPI adapter hands provider results to the CIMOM: the enumeration
 // handlers that turn each delivered instance into an object path or a CMPI
-// instance (or fetch it from the CIMOM), and the mapping of provider result
-// codes to CMPI return codes.
+// instance (or fetch it from the CIMOM).
 //
 // Contract: a handler owns each instance it receives and releases every CMPI
 // object it creates right after returning it, so an enumeration holds one
@@ -9,7 +8,6 @@
 // in `error`; it does not change the operation's return code.
 #pragma once
 
-#include <initializer_list>
 #include <memory>
 #include <string>
 
@@ -43,12 +41,6 @@ bool deliver_instance(Instance* instance, int status, void* data);
 // Fetches each delivered object from the CIMOM (getInstance with the list)
 // and returns what it gets; a failed fetch stops the walk.
 bool deliver_fetched_instance(Instance* instance, int status, void* data);
-
-struct Result_Map {
-  int result;
-  CMPIrc rc;
-};
-CMPIrc map_result(int result, std::initializer_list<Result_Map> table, CMPIrc otherwise);
 
 // The name space of an object path ("" when it has none).
 std::string name_space_of(const CMPIObjectPath* path);

@@ -45,11 +45,11 @@ class CMPI_Instance_Cursor : public Instance_Cursor {
 
 CMPI_Thread_Context::CMPI_Thread_Context(const CMPIBroker* broker, const CMPIContext* context,
                                          CMPI_Adapter* adapter)
-    : broker_(broker), context_(context), adapter_(adapter) {}
+    : broker_(broker), context_(context), adapter_(adapter), repository_(adapter ? adapter->repository() : nullptr) {}
 
-const Meta_Repository* CMPI_Thread_Context::repository() const {
-  return adapter_ ? adapter_->repository() : nullptr;
-}
+CMPI_Thread_Context::CMPI_Thread_Context(const CMPIBroker* broker, const CMPIContext* context,
+                                         const Meta_Repository* repository)
+    : broker_(broker), context_(context), adapter_(nullptr), repository_(repository) {}
 
 Instance* CMPI_Thread_Context::get_instance(const char* name_space, const Instance* model) {
   if (name_space == nullptr || model == nullptr || broker_ == nullptr) return nullptr;
@@ -59,7 +59,7 @@ Instance* CMPI_Thread_Context::get_instance(const char* name_space, const Instan
   CMPI_Ptr<CMPIInstance> found(CBGetInstance(broker_, context_, path.get(), nullptr, &rc));
   if (rc.rc != CMPI_RC_OK || !found) return nullptr;
   Instance* instance = nullptr;
-  if (make_cimple_instance(CMPI_Env{broker_, repository(), name_space}, model->meta_class, path.get(), found.get(),
+  if (make_cimple_instance(CMPI_Env{broker_, repository_, name_space}, model->meta_class, path.get(), found.get(),
                            instance) != CMPI_RC_OK)
     return nullptr;
   return instance;
@@ -72,7 +72,7 @@ std::unique_ptr<Instance_Cursor> CMPI_Thread_Context::enum_instances(const char*
   if (!path || rc.rc != CMPI_RC_OK) return nullptr;
   CMPI_Ptr<CMPIEnumeration> enumeration(CBEnumInstances(broker_, context_, path.get(), nullptr, &rc));
   if (!enumeration || rc.rc != CMPI_RC_OK) return nullptr;
-  return std::make_unique<CMPI_Instance_Cursor>(CMPI_Env{broker_, repository(), name_space}, model->meta_class,
+  return std::make_unique<CMPI_Instance_Cursor>(CMPI_Env{broker_, repository_, name_space}, model->meta_class,
                                                 std::move(path), std::move(enumeration));
 }
 
@@ -122,15 +122,17 @@ bool CMPI_Thread_Context::get_username(std::string& user) {
   return true;
 }
 
+// A started thread has no provider of its own to keep loaded.
 void CMPI_Thread_Context::allow_unload(bool flag) {
   if (adapter_) adapter_->set_unload_allowed(flag);
 }
 
+// The new thread may outlive the adapter of this call: it gets no adapter.
 Thread_Context* CMPI_Thread_Context::new_thread_context() {
   if (broker_ == nullptr) return nullptr;
   CMPIContext* context = CBPrepareAttachThread(broker_, context_);
   if (context == nullptr) return nullptr;
-  return new CMPI_Thread_Context(broker_, context, adapter_);
+  return new CMPI_Thread_Context(broker_, context, repository_);
 }
 
 void CMPI_Thread_Context::thread_attach() { CBAttachThread(broker_, context_); }

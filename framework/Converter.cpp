@@ -161,8 +161,10 @@ int apply_property_list(Instance* instance, const char* const* properties, bool 
     if (feature->flags & FLAG_PROPERTY) {
       *null_flag(instance, reinterpret_cast<const Meta_Property*>(feature)) = 0;
     } else {
+      // An empty instance marks a wanted reference; an embedded value has
+      // no such marker and would go out as an empty instance.
       auto* mr = reinterpret_cast<const Meta_Reference*>(feature);
-      if (!is_reference_array(mr) && reference_of(instance, mr) == nullptr)
+      if (!is_reference_array(mr) && !is_embedded(feature) && reference_of(instance, mr) == nullptr)
         reference_slot(instance, mr) = create(mr->meta_class, false);
     }
   }

@@ -122,6 +122,11 @@ inline Instance* reference_of(const Instance* instance, const Meta_Reference* mr
   return *static_cast<Instance* const*>(slot(instance, mr->offset));
 }
 inline bool is_reference_array(const Meta_Reference* mr) { return mr->subscript != 0; }
+// An embedded instance or object: held in a reference slot, but a value of
+// its owner that crosses CMPI as an instance, never an association's end.
+inline bool is_embedded(const Meta_Feature* feature) {
+  return (feature->flags & (FLAG_EMBEDDED_INSTANCE | FLAG_EMBEDDED_OBJECT)) != 0;
+}
 inline bool is_array(const Meta_Property* mp) { return mp->subscript != 0; }
 
 // --- text -----------------------------------------------------------------------

@@ -45,7 +45,7 @@ bool pass_references(Instance* association, int, void* data) {
   const Meta_Class* mc = association->meta_class;
   for (size_t i = 0; i < mc->num_meta_features; ++i) {
     const Meta_Feature* mf = mc->meta_features[i];
-    if (!(mf->flags & FLAG_REFERENCE)) continue;
+    if (!(mf->flags & FLAG_REFERENCE) || is_embedded(mf)) continue;
     auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
     if (is_reference_array(mr) || (name_given(walk->role) && !equal_nocase(mr->name, walk->role))) continue;
     if (refers_to(association, mr, walk->source)) return walk->proc(association, 0, walk->data);
@@ -77,7 +77,7 @@ bool pass_associators(Instance* association, int, void* data) {
   std::vector<const Meta_Reference*> far_ends;
   for (size_t i = 0; i < mc->num_meta_features; ++i) {
     const Meta_Feature* mf = mc->meta_features[i];
-    if (!(mf->flags & FLAG_REFERENCE)) continue;
+    if (!(mf->flags & FLAG_REFERENCE) || is_embedded(mf)) continue;
     auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
     if (is_reference_array(mr)) continue;
     if (!has_source && refers_to(association, mr, walk->source)) {
@@ -106,10 +106,11 @@ bool pass_associators(Instance* association, int, void* data) {
   return go_on;
 }
 
+// The result of a fallback from the enumeration it ran: only a successful
+// enumeration succeeds (a provider that threw answered -1).
 int map_enumeration(int result, int failed, int access_denied) {
-  if (result == ENUM_INSTANCES_FAILED) return failed;
-  if (result == ENUM_INSTANCES_ACCESS_DENIED) return access_denied;
-  return 0;
+  if (result == ENUM_INSTANCES_OK) return 0;
+  return result == ENUM_INSTANCES_ACCESS_DENIED ? access_denied : failed;
 }
 
 }  // namespace
@@ -140,10 +141,11 @@ int Provider_Handle::get_instance(const Instance* model, Instance*& instance) {
   int result = call(OPERATION_GET_INSTANCE, provider_, model, &instance);
   if (result != GET_INSTANCE_UNSUPPORTED) return result;
   Get_Instance_Search search{model};
-  result = enum_instances(model, find_matching, &search);
+  result = map_enumeration(enum_instances(model, find_matching, &search), GET_INSTANCE_FAILED,
+                           GET_INSTANCE_ACCESS_DENIED);
   if (result != 0 || search.found == nullptr) {
     unref(search.found);
-    return GET_INSTANCE_NOT_FOUND;
+    return result != 0 ? result : GET_INSTANCE_NOT_FOUND;
   }
   instance = search.found;
   return GET_INSTANCE_OK;

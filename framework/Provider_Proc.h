@@ -63,6 +63,18 @@ inline int close_association(int result, int unsupported, const Handler& handler
 
 inline Handler handler_of(void* proc, void* data) { return Handler{reinterpret_cast<Handler_Proc>(proc), data}; }
 
+// Runs one enumerating operation of a provider: a provider that throws
+// answers -1, so the closing handler call that follows still happens and the
+// handler's owner learns the enumeration failed.
+template <class Work>
+int guarded(Work&& work) noexcept {
+  try {
+    return work();
+  } catch (...) {
+    return -1;
+  }
+}
+
 template <class P>
 int dispatch(const Provider_Registration* registration, int operation, void* a0, void* a1, void* a2, void* a3,
              void* a4, void* a5, void* a6) {
@@ -87,7 +99,7 @@ int dispatch(const Provider_Registration* registration, int operation, void* a0,
       return provider->get_instance(instance, *static_cast<Instance**>(a2));
     case OPERATION_ENUM_INSTANCES: {
       Handler handler = handler_of(a2, a3);
-      int result = provider->enum_instances(instance, handler);
+      int result = guarded([&] { return provider->enum_instances(instance, handler); });
       handler(nullptr, result);
       return result;
     }
@@ -104,21 +116,27 @@ int dispatch(const Provider_Registration* registration, int operation, void* a0,
       return 0;
     case OPERATION_ENUM_ASSOCIATOR_NAMES:
       if (!association) return -1;
-      return close_association(
-          provider->enum_associator_names(instance, static_cast<const char*>(a2), static_cast<const char*>(a3),
-                                          static_cast<const char*>(a4), handler_of(a5, a6)),
-          ENUM_ASSOCIATOR_NAMES_UNSUPPORTED, handler_of(a5, a6));
+      return close_association(guarded([&] {
+                                 return provider->enum_associator_names(
+                                     instance, static_cast<const char*>(a2), static_cast<const char*>(a3),
+                                     static_cast<const char*>(a4), handler_of(a5, a6));
+                               }),
+                               ENUM_ASSOCIATOR_NAMES_UNSUPPORTED, handler_of(a5, a6));
     case OPERATION_ENUM_REFERENCES:
       if (!association) return -1;
-      return close_association(provider->enum_references(instance, static_cast<const Instance*>(a2),
-                                                         static_cast<const char*>(a3), handler_of(a4, a5)),
+      return close_association(guarded([&] {
+                                 return provider->enum_references(instance, static_cast<const Instance*>(a2),
+                                                                  static_cast<const char*>(a3), handler_of(a4, a5));
+                               }),
                                ENUM_REFERENCES_UNSUPPORTED, handler_of(a4, a5));
     case OPERATION_ENUM_ASSOCIATORS:
       if (!association) return -1;
-      return close_association(
-          provider->enum_associators(instance, static_cast<const char*>(a2), static_cast<const char*>(a3),
-                                     static_cast<const char*>(a4), handler_of(a5, a6)),
-          ENUM_ASSOCIATORS_UNSUPPORTED, handler_of(a5, a6));
+      return close_association(guarded([&] {
+                                 return provider->enum_associators(
+                                     instance, static_cast<const char*>(a2), static_cast<const char*>(a3),
+                                     static_cast<const char*>(a4), handler_of(a5, a6));
+                               }),
+                               ENUM_ASSOCIATORS_UNSUPPORTED, handler_of(a5, a6));
     default:  // indications and unknown codes
       return -1;
   }

@@ -94,7 +94,9 @@ int Value::set_feature(Instance* instance, const Meta_Feature* feature) const {
       return 0;
     }
     Instance* target = this->instance();
-    if (target && !is_subclass(mr->meta_class, target->meta_class)) {
+    // An embedded object of no declared class holds an instance of any class.
+    const bool any_class = mr->meta_class == &Instance_meta_class;
+    if (target && !any_class && !is_subclass(mr->meta_class, target->meta_class)) {
       CIMPLE_WARN("failed to assign instance of %s to %s.%s", class_name(target), class_name(instance), mr->name);
       return -1;
     }

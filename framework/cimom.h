@@ -23,7 +23,8 @@ int modify_instance(const char* name_space, const Instance* instance);
 int delete_instance(const char* name_space, const Instance* instance);
 bool get_username(std::string& user);
 // Asks the adapter of the current call to refuse (false) or accept (true)
-// being unloaded at its next non-terminating cleanup.
+// being unloaded at its next non-terminating cleanup; nothing on a thread
+// started during a call, which belongs to no adapter.
 void allow_unload(bool flag);
 
 }  // namespace cimom

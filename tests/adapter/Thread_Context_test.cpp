@@ -135,7 +135,7 @@ TEST_F(Threads, TheUserNameComesFromThePrincipalOrIsReportedMissing) {
   EXPECT_EQ(user, "alice");
   CMPIContext* anonymous = fake::new_context(nullptr);
   {
-    CMPI_Thread_Context bare(broker_.get(), anonymous, nullptr);
+    CMPI_Thread_Context bare(broker_.get(), anonymous, static_cast<CMPI_Adapter*>(nullptr));
     Thread_Context::push(&bare);
     EXPECT_FALSE(cimom::get_username(user));
     Thread_Context::pop();

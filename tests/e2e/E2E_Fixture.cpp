@@ -88,9 +88,11 @@ void E2E_Test::TearDown() {
 }
 
 test::Store& E2E_Test::module_store() {
-  auto hook = reinterpret_cast<test::Store* (*)()>(dlsym(handle_, "nrv_test_module_store"));
+  auto hook = reinterpret_cast<test::Store* (*)()>(module_symbol("nrv_test_module_store"));
   return *hook();
 }
+
+void* E2E_Test::module_symbol(const char* name) { return dlsym(handle_, name); }
 
 std::string E2E_Test::traces() const { return read_traces().substr(trace_start_); }
 

@@ -41,6 +41,8 @@ class E2E_Test : public ::testing::Test {
 
   // The module's store (the test module's hook); only between operations.
   test::Store& module_store();
+  // Another hook the test module exports, or null.
+  void* module_symbol(const char* name);
   // Traces written since SetUp.
   std::string traces() const;
 

@@ -1,6 +1,7 @@
 // The real module in the host: it loads, every provider's factories resolve
 // and make MIs, and a catalogue-backed class answers the site's instances
-// through the nrv-cim client.
+// through the nrv-cim client, and an empty success without the management
+// library.
 #include <cstdlib>
 #include <set>
 
@@ -55,6 +56,26 @@ TEST(RealModule, ChipEnumerationThroughTheClientAnswersTheSampleSitesChips) {
   EXPECT_NE(run.out.find("NRVTAVO_Chip.Tag=\"NV52C4213A07719\""), std::string::npos) << run.out;
   EXPECT_NE(run.out.find("NRVTAVO_Chip.Tag=\"NV41T5120A03342\""), std::string::npos) << run.out;
   EXPECT_EQ(run.err.find("CMPI_RC_ERR"), std::string::npos) << run.err;
+}
+
+// Without the management library the module serves what needs none: the
+// settings answer, so a client can tell a missing library from a host
+// without adapters, and adapter classes answer an empty success, so a
+// CIMOM's request across every provider still succeeds.
+TEST(RealModule, WithoutTheManagementLibraryTheSettingsAreStillServed) {
+  const std::vector<std::string> no_management = {"LD_LIBRARY_PATH=" + std::string(std::getenv("NRV_BUILD_DIR")) +
+                                                  "/lib/sim-nomgmt"};
+  auto settings = nrv::host::test::runClient(
+      {"-m", real_module(), "ei", "root/norvane:NRVTAVO_ProviderConfigSetting"}, no_management);
+  EXPECT_EQ(settings.status, 0) << settings.err;
+  for (const char* name : {"cachetimeout", "adapterrefresh", "sanrefresh"})
+    EXPECT_NE(settings.out.find(std::string("paramname = \"") + name + "\""), std::string::npos) << settings.out;
+  // Empty, so left unset: SFCB refuses any array value of this EmbeddedObject
+  // property, and its clients cannot read the explicit null it accepts.
+  EXPECT_EQ(settings.out.find("ComponentSetting"), std::string::npos) << settings.out;
+  auto chips = nrv::host::test::runClient({"-m", real_module(), "ei", "root/norvane:NRVTAVO_Chip"}, no_management);
+  EXPECT_EQ(chips.status, 0) << chips.err;
+  EXPECT_EQ(chips.out, "");
 }
 
 }  // namespace

@@ -5,6 +5,7 @@
 #include "host/EncObjects.h"
 #include "host/ObjectRegistry.h"
 #include "tests/e2e/E2E_Fixture.h"
+#include "tests/host/HostTestSupport.h"
 
 namespace e2e {
 namespace {
@@ -86,6 +87,58 @@ TEST_F(Robustness, ANullKeyAndANullArgumentArrayAreSurvived) {
                                       {{"MinBWValues", Datum::null(CMPI_uint16 | CMPI_ARRAY)}});
   ASSERT_TRUE(result.ok()) << result.errorText();
   EXPECT_EQ(module_store().min_bandwidths, "null");
+}
+
+// A provider that throws has failed, whatever the operation: the client is
+// told so, with the provider named, and never told it succeeded.
+TEST_F(Robustness, AThrowingProviderFailsEveryOperation) {
+  module_store().throw_in_operations = true;
+  HostInstance card;
+  card.path = card_path("N");
+  card.properties = {{"Tag", Datum::string("N")}, {"CreationClassName", Datum::string("NRVTAVO_Card")}};
+  HostInstance changed = card;
+  changed.path = card_path("A");
+  setNamed(changed.properties, "Tag", Datum::string("A"));
+  setNamed(changed.properties, "Model", Datum::string("changed"));
+  const std::pair<const char*, Result> answers[] = {
+      {"create", host_->createInstance(card)},
+      {"modify", host_->modifyInstance(changed)},
+      {"delete", host_->deleteInstance(card_path("A"))},
+      {"enumerate", host_->enumerateInstances(kNs, "NRVTAVO_Card")},
+      {"enumerate names", host_->enumerateInstanceNames(kNs, "NRVTAVO_Card")},
+      {"get", host_->getInstance(card_path("A"))},
+      {"invoke", host_->invokeMethod(service_path("svc"), "RequestStateChange")},
+      {"reference names", host_->referenceNames(chip_path("X"))},
+      {"associator names", host_->associatorNames(card_path("A"))},
+      {"associators", host_->associators(card_path("A"))},
+  };
+  for (const auto& [operation, answer] : answers) {
+    EXPECT_EQ(answer.rc, CMPI_RC_ERR_FAILED) << operation;
+    EXPECT_NE(answer.message.find("_Provider: "), std::string::npos) << operation << ": " << answer.message;
+  }
+  module_store().throw_in_operations = false;
+  EXPECT_EQ(host_->enumerateInstanceNames(kNs, "NRVTAVO_Card").paths.size(), 2u);
+  EXPECT_EQ(module_store().cards.size(), 2u);
+}
+
+TEST_F(Robustness, TheClientReportsAThrowingProviderAndExitsWithOne) {
+  const std::string card = "root/norvane:NRVTAVO_Card.CreationClassName=\"NRVTAVO_Card\",Tag=\"A\"";
+  const std::string service =
+      "root/norvane:NRVTAVO_ChannelMgmtService.SystemCreationClassName=\"CIM_ComputerSystem\","
+      "SystemName=\"host\",CreationClassName=\"NRVTAVO_ChannelMgmtService\",Name=\"svc\"";
+  const std::vector<std::vector<std::string>> commands = {
+      {"ci", "root/norvane:NRVTAVO_Card.CreationClassName=\"NRVTAVO_Card\",Tag=\"N\""},
+      {"mi", card, "Model=changed"},
+      {"di", card},
+      {"ei", "root/norvane:NRVTAVO_Card"},
+      {"cm", service, "RequestStateChange", "RequestedState=2"},
+  };
+  for (std::vector<std::string> command : commands) {
+    command.insert(command.begin(), {"-m", test_module()});
+    auto run = nrv::host::test::runClient(command, {"NRV_TEST_MODULE_FAULTS=1"});
+    EXPECT_EQ(run.status, 1) << command[2] << ": " << run.out << run.err;
+    EXPECT_NE(run.err.find("CMPI_RC_ERR_FAILED"), std::string::npos) << command[2] << ": " << run.err;
+  }
 }
 
 }  // namespace

@@ -2,6 +2,7 @@
 // that implement only what a catalogue provider implements.
 #include <gtest/gtest.h>
 
+#include <stdexcept>
 #include <string>
 #include <vector>
 
@@ -80,6 +81,13 @@ class Port_Provider : public Provider_Base {
   }
 };
 
+// A provider whose enumeration throws, as a faulty one does.
+template <class Base>
+class Throwing : public Base {
+ public:
+  int enum_instances(const Instance*, const Handler&) { throw std::runtime_error("provider fault"); }
+};
+
 const Provider_Registration chip_registration = {kModuleName, "NRVTAVO_Chip_Provider", provider_proc<Chip_Provider>,
                                                  &NRVTAVO_Chip::static_meta_class, nullptr};
 const Provider_Registration containment_registration = {
@@ -88,6 +96,13 @@ const Provider_Registration containment_registration = {
 const Provider_Registration port_registration = {kModuleName, "NRVTAVO_EthernetPort_Provider",
                                                  provider_proc<Port_Provider>,
                                                  &NRVTAVO_EthernetPort::static_meta_class, nullptr};
+
+const Provider_Registration throwing_chip_registration = {kModuleName, "NRVTAVO_Chip_Provider",
+                                                          provider_proc<Throwing<Chip_Provider>>,
+                                                          &NRVTAVO_Chip::static_meta_class, nullptr};
+const Provider_Registration throwing_containment_registration = {
+    kModuleName, "NRVTAVO_CardContainsChip_Provider", provider_proc<Throwing<Containment_Provider>>,
+    &NRVTAVO_CardContainsChip::static_meta_class, nullptr};
 
 // Collects what an enumeration delivers, and the closing call's status.
 struct Collected {
@@ -146,6 +161,34 @@ TEST_F(Handle, EnumerationAlwaysEndsWithAClosingCall) {
   EXPECT_EQ(got.tags, (std::vector<std::string>{"c1", "c2"}));
   EXPECT_EQ(got.closing_calls, 1);
   EXPECT_EQ(got.closing_status, 0);
+}
+
+// The closing call still comes, and no fallback built on the enumeration
+// turns its failure into a success.
+TEST_F(Handle, AThrowingEnumerationClosesAndFailsEveryFallback) {
+  open(&throwing_chip_registration);
+  Collected got;
+  EXPECT_EQ(handle_->enum_instances(nullptr, Collected::handle, &got), -1);
+  EXPECT_EQ(got.closing_calls, 1);
+  EXPECT_EQ(got.closing_status, -1);
+  auto* model = chip("c1");
+  Instance* found = nullptr;
+  EXPECT_EQ(handle_->get_instance(model, found), GET_INSTANCE_FAILED);
+  EXPECT_EQ(found, nullptr);
+  unref(model);
+
+  TearDown();
+  open(&throwing_containment_registration);
+  auto* source = card("k1");
+  Collected references;
+  EXPECT_EQ(handle_->enum_references(source, nullptr, nullptr, Collected::handle, &references),
+            ENUM_REFERENCES_FAILED);
+  EXPECT_EQ(references.closing_status, ENUM_REFERENCES_FAILED);
+  Collected names;
+  EXPECT_EQ(handle_->enum_associator_names(source, nullptr, nullptr, nullptr, Collected::handle, &names),
+            ENUM_ASSOCIATOR_NAMES_FAILED);
+  EXPECT_EQ(names.closing_status, ENUM_ASSOCIATOR_NAMES_FAILED);
+  unref(source);
 }
 
 TEST_F(Handle, ReferencesFallbackFindsTheAssociationsOfAnInstance) {
