@@ -1,5 +1,6 @@
 // Wrapper operations on adapter-wide data: dead NIC ports, feature lists,
 // FCoE driver parameters, optimized-access LUNs and general VPD.
+#include "access/NRV_VpdWalk.h"
 #include "access/NRV_WrapperCall.h"
 
 namespace cimple {
@@ -96,18 +97,7 @@ RM_STATUS NRV_MethodWrapper::ReadVPD(const HBA_NAME& name,
       NRV_LOG(NRV_ERR, "ERROR: RM_GetVPD call failed : %d", static_cast<int>(status));
       return status;
     }
-    // The walk reads past the records it was given when the image has no end
-    // tag; a copy with a zeroed tail keeps it inside the buffer.
-    vpd.resize(vpd.size() + RM_VPD_VALUE_SIZE, 0);
-    void* cursor = vpd.data();
-    for (size_t guard = 0; cursor != nullptr && guard < RM_VPD_SIZE; ++guard) {
-      char keyword[RM_VPD_KEYWORD_SIZE] = {};
-      char value[RM_VPD_VALUE_SIZE] = {};
-      cursor = RM_GetNextVpdEntry(cursor, keyword, value);
-      if (cursor == nullptr) break;
-      entries.emplace_back(wrapper::fieldText(keyword, sizeof keyword),
-                           wrapper::fieldText(value, sizeof value));
-    }
+    for (const Vpd_Entry& entry : walkVpd(vpd)) entries.emplace_back(entry.keyword, entry.text());
     return status;
   });
 }
