@@ -241,10 +241,23 @@ const Function& FeatureTest::nth(uint32_t type, size_t n) const {
   throw std::logic_error("the site has too few functions of that kind");
 }
 
-Instance_Map& Plain_Catalogue::map(const Meta_Class& mc) {
-  auto& slot = m_Maps[&mc];
-  if (!slot) slot = std::make_unique<Instance_Map>(&mc);
-  return *slot;
+std::string text(const Instance* instance, const char* name) {
+  const Meta_Property* mp = instance ? find_property(instance->meta_class, name) : nullptr;
+  if (mp == nullptr || mp->type != STRING || is_array(mp)) return "<no such property>";
+  const auto& p = *static_cast<const Property<String>*>(slot(instance, mp->offset));
+  return p.is_null() ? "<null>" : p.value.str();
+}
+
+void expectTexts(const Instance* instance, std::initializer_list<std::pair<const char*, std::string>> expected) {
+  ASSERT_NE(instance, nullptr);
+  for (const auto& [name, value] : expected) EXPECT_EQ(text(instance, name), value) << name;
+}
+
+std::vector<std::string> texts(const Property<Array<String>>& array) {
+  std::vector<std::string> out;
+  if (!array.is_null())
+    for (const String& s : array.value) out.push_back(s.str());
+  return out;
 }
 
 }  // namespace feature_test

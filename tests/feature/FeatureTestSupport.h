@@ -2,8 +2,7 @@
 // adapter catalogue holds the instances the builders read (host system,
 // cards, chips, ports, port controllers, firmware identities and their links,
 // made from the adapter data set as the catalogue frame makes them), site
-// copies with faults loaded into the simulator in-process, and a catalogue of
-// plain maps for tests that need no agent.
+// copies with faults loaded into the simulator in-process, and text checks.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -80,17 +79,15 @@ void runFeatures(cimple::ProviderAgent& agent);
 using Snapshot = std::map<std::string, std::set<std::string>>;
 Snapshot snapshot(cimple::ProviderAgent& agent);
 
-// A catalogue of plain maps, made as they are asked for.
-class Plain_Catalogue final : public cimple::NRV_Catalogue {
- public:
-  cimple::Instance_Map& map(const cimple::Meta_Class& mc) override;
+// String property `name` of `instance` ("<null>" when null), and the check
+// of several against their expected texts.
+std::string text(const cimple::Instance* instance, const char* name);
+void expectTexts(const cimple::Instance* instance,
+                 std::initializer_list<std::pair<const char*, std::string>> expected);
+// A string-array property as texts (none when null).
+std::vector<std::string> texts(const cimple::Property<cimple::Array<cimple::String>>& array);
 
- private:
-  std::map<const cimple::Meta_Class*, std::unique_ptr<cimple::Instance_Map>> m_Maps;
-};
-
-// The instance of map `C` whose text property InstanceID (or DeviceID for
-// devices) equals `key`, or null.
+// The instance of map `C` whose InstanceID equals `key`, or null.
 template <class C>
 const C* byInstanceID(cimple::NRV_Catalogue& catalogue, const std::string& key) {
   return cimple::findIn<C>(catalogue.of<C>(), [&](const C& c) { return cimple::textOf(c.InstanceID) == key; });
