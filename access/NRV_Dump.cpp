@@ -206,16 +206,11 @@ uint32_t NRV_Dump::CreateExtFATDumpSettingClasses() {
     const auto* chip = static_cast<const NRVTAVO_Chip*>(chips[i]);
     const std::string tag = textOf(chip->Tag);
     const std::optional<Chip_Port> port = chipPort(m_Catalogue, tag);
-    char colon[kHbaNameColonSize] = {};
     HBA_NAME name{};
-    if (!port || Id2HBAName(colon, port->deviceId.c_str()) != 0) {
-      NRV_LOG(NRV_ERR, "CreateExtFATDumpSettingClasses::Id2HBAName failed");
+    if (!deviceIdToHBAName(port ? port->deviceId.c_str() : nullptr, name,
+                           "CreateExtFATDumpSettingClasses::Id2HBAName failed",
+                           "CreateExtFATDumpSettingClasses::str2HBAName failed"))
       continue;
-    }
-    if (str2HBAName(&name, colon) != 0) {
-      NRV_LOG(NRV_ERR, "CreateExtFATDumpSettingClasses::str2HBAName failed");
-      continue;
-    }
     std::vector<uint8_t> record;
     const RM_STATUS status = NRV_MethodWrapper::GetExtFATAdvancedData(name, record);
     if (status != RM_STATUS_SUCCESS) {

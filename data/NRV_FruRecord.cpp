@@ -104,16 +104,8 @@ uint32_t GetFRUVPD(const char* deviceId, NRV_FruRecord* out) {
     return 4;
   }
   std::memset(out, 0, sizeof *out);
-  char colon[kHbaNameColonSize] = {};
-  if (Id2HBAName(colon, deviceId) != 0) {
-    NRV_LOG(NRV_ERR, "Id2HBAName failed");
-    return 1;
-  }
   HBA_NAME name{};
-  if (str2HBAName(&name, colon) != 0) {
-    NRV_LOG(NRV_ERR, "str2HBAName failed");
-    return 1;
-  }
+  if (!deviceIdToHBAName(deviceId, name, "Id2HBAName failed", "str2HBAName failed")) return 1;
   std::vector<uint8_t> image(RM_VPD_V2_SIZE, 0);
   HBA_UINT32 size = RM_VPD_V2_SIZE;
   const RM_STATUS status = LRM_GetVPDV2(name, kFruVpdKind, image.data(), &size);

@@ -26,16 +26,9 @@ constexpr uint16_t kFcResourceType = 10;
 // Converts a port's identifier text into `name`; false (the failure logged
 // at `level`) when it does not convert.
 bool toName(const std::string& id, HBA_NAME& name, int level) {
-  char colon[kHbaNameColonSize] = {};
-  if (Id2HBAName(colon, id.c_str()) != 0) {
-    NRV_LOG(level, "NRVTAVO_PortVirtualization::CreatePortVirtualizationClasses::Id2HBAName failed");
-    return false;
-  }
-  if (str2HBAName(&name, colon) != 0) {
-    NRV_LOG(level, "NRVTAVO_PortVirtualization::CreatePortVirtualizationClasses::str2HBAName failed");
-    return false;
-  }
-  return true;
+  return deviceIdToHBAName(id.c_str(), name,
+                           "NRVTAVO_PortVirtualization::CreatePortVirtualizationClasses::Id2HBAName failed",
+                           "NRVTAVO_PortVirtualization::CreatePortVirtualizationClasses::str2HBAName failed", level);
 }
 
 std::string plain(const HBA_NAME& name) {

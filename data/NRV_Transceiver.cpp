@@ -192,16 +192,8 @@ NRVTAVO_Transceiver* transceiverFromSff(const uint8_t* record, const char* devic
 }
 
 NRVTAVO_Transceiver* GetSffData(NRV_Catalogue& catalogue, const char* deviceId) {
-  char colon[kHbaNameColonSize] = {};
-  if (deviceId == nullptr || Id2HBAName(colon, deviceId) != 0) {
-    NRV_LOG(NRV_ERR, "Id2HBAName failed");
-    return nullptr;
-  }
   HBA_NAME name{};
-  if (str2HBAName(&name, colon) != 0) {
-    NRV_LOG(NRV_ERR, "str2HBAName failed");
-    return nullptr;
-  }
+  if (!deviceIdToHBAName(deviceId, name, "Id2HBAName failed", "str2HBAName failed")) return nullptr;
   std::vector<uint8_t> record(RM_SFF_DATA_SIZE, 0);
   HBA_UINT32 size = RM_SFF_DATA_SIZE;
   const RM_STATUS status = LRM_GetSffData(name, record.data(), &size);

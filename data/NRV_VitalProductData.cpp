@@ -71,16 +71,8 @@ void appendText(Property<Array<String>>& array, const std::string& text) {
 
 uint32_t CreateVPD(NRV_Catalogue& catalogue, const char* deviceId) {
   NRV_LOG(NRV_DBG, "Inside CreateVPD");
-  char colon[kHbaNameColonSize] = {};
-  if (deviceId == nullptr || Id2HBAName(colon, deviceId) != 0) {
-    NRV_LOG(NRV_ERR, "Id2HBAName failed");
-    return 1;
-  }
   HBA_NAME name{};
-  if (str2HBAName(&name, colon) != 0) {
-    NRV_LOG(NRV_ERR, "str2HBAName failed");
-    return 1;
-  }
+  if (!deviceIdToHBAName(deviceId, name, "Id2HBAName failed", "str2HBAName failed")) return 1;
   std::vector<std::pair<std::string, std::string>> entries;
   const RM_STATUS status = NRV_MethodWrapper::ReadVPD(name, entries);
   if (status != RM_STATUS_SUCCESS) return status;

@@ -5,9 +5,6 @@
 #include <algorithm>
 
 #include "FeatureTestSupport.h"
-#include "access/NRV_Dump.h"
-#include "data/NRV_DriverParameters.h"
-#include "data/NRV_PortVirtualization.h"
 #include "schema/Classes.h"
 
 namespace feature_test {
@@ -61,6 +58,13 @@ const Fault_Row kRows[] = {
      "Failed to get the ExtFATDump settings for chip : NV52C4213A07719 , exited with the error code 5 "},
     {"DumpDirectory", "LRM_GetDumpDirectoryA", Target::FirstNic, {}, "Failed to get the Dump Directory"},
     {"RetentionCount", "LRM_GetDumpRetentionCount", Target::FirstNic, {}, "Failed to get the Retention Count"},
+    // A port the library no longer owns: every operation that checks it first.
+    {"LocalAdapterCheck", "RM_IsLocalHBA", Target::FirstFcoe,
+     {{"NRVTAVO_VitalProductData", kFirstFcoe}, {"NRVTAVO_ResourcePool", kFirstFcoe},
+      {"NRVTAVO_HostedResourcePool", kFirstFcoe}, {"NRVTAVO_VirtualFCPort", "10000090FA5C2EA"},
+      {"NRVTAVO_VPortHostedDependency", kFirstFcoe}, {"NRVTAVO_ElementAllocatedFromPool", kFirstFcoe},
+      {"NRVTAVO_DriverParameterSettingData", "NRV:FCoE"}},
+     "HBA IS NOT LOCAL"},
 };
 
 class FaultedFeatures : public FeatureTest, public ::testing::WithParamInterface<Fault_Row> {
@@ -126,41 +130,6 @@ TEST_P(FaultedFeatures, TakeAwayOnlyTheirOwnInstances) {
 
 INSTANTIATE_TEST_SUITE_P(EachCall, FaultedFeatures, ::testing::ValuesIn(kRows),
                          [](const ::testing::TestParamInfo<Fault_Row>& info) { return info.param.name; });
-
-// Faults that leave every instance but empty a property or change a result.
-TEST_F(FeatureTest, FaultsThatEmptyAPropertyOrChangeTheResult) {
-  const std::string nic = nth(kNICAdapterType).id, fc = nth(kFCoEAdapterType).id;
-  nlohmann::json site = sampleSite();
-  addFault(site, {{"function", "LRM_GetDumpDirectoryA"}, {"status", 5}, {"adapter", nic}});
-  addFault(site, {{"function", "LRM_VPGetAttributes"}, {"status", 5}, {"adapter", fc}});
-  addFault(site, {{"function", "RM_IsLocalHBA"}, {"status", 5}, {"adapter", fc}, {"call", 1}});
-  addFault(site, {{"function", "RM_ListDeadNicPorts"}, {"status", 5}});
-  loadSite(site);
-  std::lock_guard<std::recursive_mutex> lock(data());
-  // A port the library does not own answers 1 and publishes nothing.
-  EXPECT_EQ(FCoEGetDriverParam(catalogue(), fc, false), 1u);
-  EXPECT_TRUE(capture.contains("INVALID wwpn"));
-  EXPECT_EQ(NRV_PortVirtualization(catalogue()).CreatePortVirtualizationClasses(),
-            NRV_PortVirtualization::kListingFailed);
-  for (size_t i = 0; i < catalogue().of<NRVTAVO_VirtualFCPort>().size(); ++i)
-    EXPECT_TRUE(static_cast<const NRVTAVO_VirtualFCPort*>(catalogue().of<NRVTAVO_VirtualFCPort>()[i])
-                    ->VPortName.is_null());
-  NRV_Dump dump(catalogue());
-  dump.CreateDumpServiceClasses();
-  const auto* data1 = byInstanceID<NRVTAVO_ExtFATDumpData>(catalogue(), std::string("NRV:TAVO ExtFATDumpData:") + kCard1);
-  ASSERT_NE(data1, nullptr);
-  EXPECT_TRUE(data1->DumpDirectory.is_null());
-  EXPECT_EQ(data1->RetentionCount.value, 10u);
-  // With only a down port left, a library that cannot list dead ports gets no service.
-  dump.ClearDumpServiceClasses(NRV_Dump::kAll);
-  catalogue().of<NRVTAVO_Chip>().clear();
-  auto* down = makeInstance<NRVTAVO_DownEthernetPort>();
-  down->DeviceID.set("0090FA71B4030000");
-  catalogue().insert(down);
-  dump.CreateDumpServiceClasses();
-  EXPECT_TRUE(catalogue().of<NRVTAVO_DumpService>().empty());
-  EXPECT_TRUE(capture.contains("CreateDumpServiceClasses::Failure In Getting Dead NIC Ports. Rm Error: [ 5 ]"));
-}
 
 }  // namespace
 }  // namespace feature_test

@@ -292,6 +292,14 @@ TEST_F(FeatureTest, DumpServiceWithOnlyDownPortsHasNoAffectedElements) {
   EXPECT_TRUE(capture.contains("Dump Service/Chip class not exist, Cannot continue further"));
   dump.ClearDumpServiceClasses(NRV_Dump::kAll);
   EXPECT_TRUE(catalogue().of<NRVTAVO_DumpService>().empty());
+
+  // A library that cannot list the dead ports gets no service for them.
+  nlohmann::json site = sampleSite();
+  addFault(site, {{"function", "RM_ListDeadNicPorts"}, {"status", 5}});
+  loadSite(site);
+  dump.CreateDumpServiceClasses();
+  EXPECT_TRUE(catalogue().of<NRVTAVO_DumpService>().empty());
+  EXPECT_TRUE(capture.contains("CreateDumpServiceClasses::Failure In Getting Dead NIC Ports. Rm Error: [ 5 ]"));
 }
 
 TEST(TraceLevels, NamesAndNumbersBothWays) {
