@@ -112,6 +112,20 @@ int Id2HBAName(char* out, const char* deviceId) {
   return 0;
 }
 
+bool deviceIdToHBAName(const char* deviceId, HBA_NAME& name, const char* id2Failed, const char* strFailed,
+                       int level) {
+  char colon[kHbaNameColonSize] = {};
+  if (Id2HBAName(colon, deviceId) != 0) {
+    NRV_LOG(level, "%s", id2Failed);
+    return false;
+  }
+  if (str2HBAName(&name, colon) != 0) {
+    NRV_LOG(level, "%s", strFailed);
+    return false;
+  }
+  return true;
+}
+
 char* HBAName2string(const HBA_NAME& name, char* out) {
   return out ? writeHex(name.wwn, 8, 0, out) : nullptr;
 }

@@ -40,6 +40,13 @@ int str2HBAName(HBA_NAME* out, const char* text);
 // null argument or an identifier shorter than 16 characters.
 int Id2HBAName(char* out, const char* deviceId);
 
+// A device identifier text to its name through the colon form (Id2HBAName,
+// then str2HBAName), as the catalogue builders name adapters.  False when a
+// step fails; that step's failure is logged at `level` as `id2Failed` or
+// `strFailed`.
+bool deviceIdToHBAName(const char* deviceId, HBA_NAME& name, const char* id2Failed, const char* strFailed,
+                       int level = 3 /* NRV_ERR */);
+
 // Plain and colon forms of a name; `out` of kHbaNamePlainSize /
 // kHbaNameColonSize bytes.  A null `out` writes nothing and returns null.
 char* HBAName2string(const HBA_NAME& name, char* out);

@@ -1,5 +1,8 @@
 // Wrapper operations on adapter-wide data: dead NIC ports, feature lists,
 // FCoE driver parameters, optimized-access LUNs and general VPD.
+#include <algorithm>
+
+#include "access/NRV_VpdWalk.h"
 #include "access/NRV_WrapperCall.h"
 
 namespace cimple {
@@ -58,6 +61,10 @@ RM_STATUS NRV_MethodWrapper::nrvcimSetDriverParam(const HBA_NAME& name, bool glo
   });
 }
 
+namespace {
+constexpr HBA_UINT32 kMostDriverParams = 4096;
+}  // namespace
+
 RM_STATUS NRV_MethodWrapper::ReadDriverParams(const HBA_NAME& name, bool global,
                                               std::vector<RM_DRIVER_PARAM>& params) {
   const char* call = global ? "RM_GetDriverParamsGlobal" : "RM_GetDriverParams";
@@ -67,12 +74,20 @@ RM_STATUS NRV_MethodWrapper::ReadDriverParams(const HBA_NAME& name, bool global,
       return global ? LRM_GetDriverParamsGlobal(name, params.data(), &count)
                     : LRM_GetDriverParams(name, params.data(), &count);
     };
+    const char* caller = global ? "nrvcimGetDriverParamsGlobal" : "nrvcimGetDriverParams";
     HBA_UINT32 count = 52;
     RM_STATUS status = read(count);
     NRV_LOG(NRV_DBG, "%s: status=%d", call, static_cast<int>(status));
     if ((status == RM_STATUS_ERROR_BUFFER_TOO_SMALL || status == RM_STATUS_ERROR_MORE_DATA) &&
-        count > params.size())
+        count > params.size()) {
+      // A count no driver has is a broken answer, not a reason to allocate it.
+      count = std::min(count, kMostDriverParams);
       status = read(count);
+      if (status != RM_STATUS_SUCCESS)
+        NRV_LOG(NRV_ERR, "ERROR: %s: %s call failed (a) (%d)", caller, call, static_cast<int>(status));
+    } else if (status != RM_STATUS_SUCCESS) {
+      NRV_LOG(NRV_ERR, "ERROR: %s: %s call failed (b) (%d)", caller, call, static_cast<int>(status));
+    }
     if (status != RM_STATUS_SUCCESS) {
       params.clear();
       return status;
@@ -96,18 +111,7 @@ RM_STATUS NRV_MethodWrapper::ReadVPD(const HBA_NAME& name,
       NRV_LOG(NRV_ERR, "ERROR: RM_GetVPD call failed : %d", static_cast<int>(status));
       return status;
     }
-    // The walk reads past the records it was given when the image has no end
-    // tag; a copy with a zeroed tail keeps it inside the buffer.
-    vpd.resize(vpd.size() + RM_VPD_VALUE_SIZE, 0);
-    void* cursor = vpd.data();
-    for (size_t guard = 0; cursor != nullptr && guard < RM_VPD_SIZE; ++guard) {
-      char keyword[RM_VPD_KEYWORD_SIZE] = {};
-      char value[RM_VPD_VALUE_SIZE] = {};
-      cursor = RM_GetNextVpdEntry(cursor, keyword, value);
-      if (cursor == nullptr) break;
-      entries.emplace_back(wrapper::fieldText(keyword, sizeof keyword),
-                           wrapper::fieldText(value, sizeof value));
-    }
+    for (const Vpd_Entry& entry : walkVpd(vpd)) entries.emplace_back(entry.keyword, entry.text());
     return status;
   });
 }

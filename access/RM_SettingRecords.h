@@ -125,3 +125,37 @@ struct RM_DRIVER_PARAM {
 static_assert(sizeof(RM_DRIVER_PARAM) == 132);
 static_assert(offsetof(RM_DRIVER_PARAM, help) == 52);
 static_assert(offsetof(RM_DRIVER_PARAM, changeableType) == 100);
+
+// ---- Event-log (extended FAT dump) configuration ---------------------------------------
+// LRM_Get_VG_EventLogConfigDataAll answers a header and one record per firmware
+// module; the size argument is in bytes and "too small" (7) answers the size
+// needed.  Mode i of a module is the flag 1 << i; trace levels are the
+// library's numbers 1 (disable) to 11 (always).
+enum : HBA_UINT32 {
+  RM_EVENT_LOG_MODE_RAM = 0x1,
+  RM_EVENT_LOG_MODE_UART = 0x2,
+  RM_EVENT_LOG_MODE_NVRAM = 0x4,
+  RM_EVENT_LOG_MODE_TFTP = 0x8,
+};
+inline constexpr size_t RM_EVENT_LOG_MODE_COUNT = 4;  // ram, uart, nvram, tftp
+
+struct RM_EVENT_LOG_MODE_SETTING {
+  HBA_UINT32 traceLevel;   // 0 library's numbering
+  HBA_UINT32 portMask;     // 4 ports the mode logs for
+  HBA_UINT32 pciFuncMask;  // 8 PCI functions the mode logs for
+};
+static_assert(sizeof(RM_EVENT_LOG_MODE_SETTING) == 12);
+
+struct RM_EVENT_LOG_MODULE {
+  char name[32];                                              //  0 NUL-terminated
+  HBA_UINT32 modeFlags;                                       // 32 RM_EVENT_LOG_MODE_* the module logs to
+  RM_EVENT_LOG_MODE_SETTING modes[RM_EVENT_LOG_MODE_COUNT];  // 36 by mode index; meaningful when its flag is set
+};
+static_assert(sizeof(RM_EVENT_LOG_MODULE) == 84);
+static_assert(offsetof(RM_EVENT_LOG_MODULE, modes) == 36);
+
+struct RM_EVENT_LOG_CONFIG_HEADER {
+  HBA_UINT32 count;     // modules that follow
+  HBA_UINT32 reserved;  // library's
+};
+static_assert(sizeof(RM_EVENT_LOG_CONFIG_HEADER) == 8);

@@ -284,6 +284,18 @@ struct RM_VPORT_ENTRY {
 };
 static_assert(sizeof(RM_VPORT_ENTRY) == 24);
 
+// LRM_VPGetAttributes answers one virtual port's attributes.
+struct RM_VPORT_ATTRIBUTES {
+  HBA_NAME portName;   //   0
+  HBA_NAME nodeName;   //   8
+  HBA_UINT32 fcId;     //  16
+  HBA_UINT32 state;    //  20 1 online
+  char name[64];       //  24 the virtual port's symbolic name, NUL-terminated
+  char vmName[64];     //  88 the virtual machine using it
+};
+static_assert(sizeof(RM_VPORT_ATTRIBUTES) == 152);
+static_assert(offsetof(RM_VPORT_ATTRIBUTES, name) == 24);
+
 // ---- Dump file names ---------------------------------------------------------
 // LRM_GetDumpFileNames: a 32-bit count (in: capacity, out: number needed or
 // written) followed by that many 256-byte names; 191 means "too small".

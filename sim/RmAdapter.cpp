@@ -1,8 +1,9 @@
 // Management-library operations on a function as a whole: initialisation,
 // attribute and statistics blobs, features, PCI registers, port enable,
-// beacon and the dump settings.
+// beacon, the dump settings and the event-log configuration.
 #include <algorithm>
 
+#include "access/RM_SettingRecords.h"
 #include "sim/AttributeBlob.h"
 #include "sim/AttributeSets.h"
 #include "sim/RmCommon.h"
@@ -158,6 +159,26 @@ RM_STATUS handle_SetDumpRetentionCount(HBA_NAME a1, HBA_UINT32 count) {
   });
 }
 
+// The card's event-log configuration: the header, then one module record each.
+RM_STATUS handle_Get_VG_EventLogConfigDataAll(HBA_NAME a1, void* buffer, HBA_UINT32* size) {
+  return on_function(a1, [&](Site& s, FunctionRef r) -> RM_STATUS {
+    const std::vector<EventLogModule>& modules = card_of(s, r).event_log;
+    if (modules.empty()) return RM_STATUS_ITEM_NOT_OFFERED;
+    std::vector<RM_EVENT_LOG_MODULE> records(modules.size());
+    for (size_t i = 0; i < modules.size(); ++i) {
+      RM_EVENT_LOG_MODULE& rec = records[i];
+      std::memset(&rec, 0, sizeof rec);
+      put_text(rec.name, sizeof rec.name, modules[i].name);
+      for (size_t m = 0; m < RM_EVENT_LOG_MODE_COUNT; ++m) {
+        const EventLogMode& mode = modules[i].modes[m];
+        if (!mode.enabled) continue;
+        rec.modeFlags |= 1u << m;
+        rec.modes[m] = {mode.level, mode.port_mask, mode.pci_func_mask};
+      }
+    }
+    return deliver_list(records, sizeof(RM_EVENT_LOG_CONFIG_HEADER), buffer, size);
+  });
+}
 
 // Registrations are kept so that they can be removed; the site never changes
 // on its own, so no event is ever delivered.

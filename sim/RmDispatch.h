@@ -51,7 +51,7 @@ NRV_RM_PAIRED_FUNCTIONS(NRVSIM_SIG_)
   X(CNA_SetPGSetting) X(CNA_SetTLV) X(CNA_GetTLV) X(GetQoS) X(SetQoS) X(SetAdapterAttribute) \
   X(SetBootBiosState) X(SetNetbootParams) X(SetPhyPortSpeedSettings) X(GetServerAttributes) \
   X(RegisterForAdapterPortEvents) X(UnRegisterForAdapterPortEvents) X(SetDebugTraces)        \
-  X(VPDelete)
+  X(VPDelete) X(Get_VG_EventLogConfigDataAll)
 
 template <class Tag>
 struct Dispatch {

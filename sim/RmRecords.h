@@ -96,16 +96,8 @@ struct DriverParamRecord {
 };
 static_assert(sizeof(DriverParamRecord) == 132);
 
-// RM_VPGetAttributes.
-struct VPortAttributes {
-  HBA_NAME portName;   //   0
-  HBA_NAME nodeName;   //   8
-  HBA_UINT32 fcId;     //  16
-  HBA_UINT32 state;    //  20 1 online
-  char name[64];       //  24 virtual port's symbolic name
-  char vmName[64];     //  88
-};
-static_assert(sizeof(VPortAttributes) == 152);
+// RM_VPGetAttributes: the shared record.
+using VPortAttributes = RM_VPORT_ATTRIBUTES;
 
 // RM_DiagReadPCIRegistersV2 answers the standard 256-byte configuration space.
 inline constexpr HBA_UINT32 kPciConfigSize = 256;

@@ -2,6 +2,7 @@
 // is reported with its JSON path so a hand-edited site is easy to mend.
 #include "sim/SiteLoader.h"
 
+#include <algorithm>
 #include <fstream>
 #include <set>
 #include <sstream>
@@ -181,6 +182,35 @@ SffData read_sff(const Node& n) {
     s.rx_thresholds = read_thresholds(d, "rx_power_thresholds", {15849, 100, 12589, 158});
   }
   return s;
+}
+
+// "event_log": [{"module": "FCoE", "modes": {"ram": {"level": 5, "port_mask": 3,
+// "pci_func_mask": "0x3f"}, "uart": {"level": 9}}}, ...]; absent modes log nowhere.
+std::vector<EventLogModule> read_event_log(const Node& n) {
+  static constexpr const char* kModes[] = {"ram", "uart", "nvram", "tftp"};
+  std::vector<EventLogModule> out;
+  for (const Node& m : n.items("event_log")) {
+    EventLogModule module;
+    module.name = m.at("module").text();
+    if (module.name.empty() || module.name.size() > 31) m.at("module").fail("1 to 31 characters");
+    if (m.has("modes")) {
+      const Node modes = m.at("modes");
+      if (!modes.j.is_object()) modes.fail("must map mode names to their settings");
+      for (auto it = modes.j.begin(); it != modes.j.end(); ++it) {
+        const auto known = std::find(std::begin(kModes), std::end(kModes), it.key());
+        if (known == std::end(kModes)) modes.at(it.key().c_str()).fail("not one of ram, uart, nvram, tftp");
+        const Node mode = modes.at(it.key().c_str());
+        EventLogMode& setting = module.modes[static_cast<size_t>(known - std::begin(kModes))];
+        setting.enabled = true;
+        setting.level = mode.u32("level", 5);
+        if (setting.level < 1 || setting.level > 11) mode.at("level").fail("a trace level 1 to 11");
+        setting.port_mask = mode.u32("port_mask", 0xFFFFFFFF);
+        setting.pci_func_mask = mode.u32("pci_func_mask", 0xFFFFFFFF);
+      }
+    }
+    out.push_back(std::move(module));
+  }
+  return out;
 }
 
 Kind read_kind(const Node& n) {
@@ -373,6 +403,7 @@ Card read_card(const Node& n) {
   }
   c.vpd = read_vpd(n, "vpd");
   c.fru = read_vpd(n, "fru");
+  c.event_log = read_event_log(n);
   for (const Node& f : n.items("features")) {
     const uint64_t v = f.number();
     if (v > UINT32_MAX) f.fail("out of range");

@@ -215,6 +215,20 @@ struct Function {
   QosLimits qos;
 };
 
+// One firmware module's event-log (trace) configuration: per mode ("ram",
+// "uart", "nvram", "tftp" in that order) whether it logs there, at which
+// trace level (library numbering 1..11) and for which ports and functions.
+struct EventLogMode {
+  bool enabled = false;
+  uint32_t level = 5;
+  uint32_t port_mask = 0xFFFFFFFF;
+  uint32_t pci_func_mask = 0xFFFFFFFF;
+};
+struct EventLogModule {
+  std::string name;
+  std::array<EventLogMode, 4> modes{};
+};
+
 struct Firmware {
   std::string operational, flash, boot, option_rom, ulp, sp, ncsi, ipl_file, uefi;
 };
@@ -227,6 +241,7 @@ struct Card {
   int32_t temperature = 45, warning_temp = 85, critical_temp = 100;
   Firmware firmware;
   VpdEntries vpd, fru;
+  std::vector<EventLogModule> event_log;  // empty: the card offers no event-log configuration
   std::vector<uint32_t> features;
   std::vector<PhysicalPort> ports;
   std::vector<Function> functions;

@@ -3,9 +3,11 @@
 
 Every card is a converged adapter whose physical ports each carry a NIC, an
 iSCSI and an FCoE function; FCoE ports see FC targets and iSCSI ports iSCSI
-targets, each with LUNs of rotating SCSI device types.  Names are derived
-from the card and port numbers, so two runs with the same arguments write
-the same file.
+targets, each with LUNs of rotating SCSI device types.  Each port has an
+optical module (SFF data with diagnostics); the first FCoE port of a card has
+one virtual port and a local driver parameter; every card has FRU and general
+VPD and an event-log configuration.  Names are derived from the card and port
+numbers, so two runs with the same arguments write the same file.
 
   tools/gen_site.py --cards 16 --ports 4 --targets 8 --luns 16 -o big.json
 """
@@ -53,6 +55,26 @@ def function_id(kind, card, port):
     return (kind << 20) | (card << 6) | port
 
 
+# Global FCoE driver parameters of the library.
+DRIVER_PARAMS = [
+    {"name": "log-verbose", "min": 0, "max": 65535, "default": 0, "current": 0,
+     "help": "Verbose logging bit-mask"},
+    {"name": "lun-queue-depth", "min": 1, "max": 128, "default": 30, "current": 30,
+     "help": "Max number of FCP commands queued to a LUN"},
+]
+
+
+def sff(card, port):
+    """An SR optical module with diagnostics and the default thresholds."""
+    return {
+        "vendor": "NORVANE", "part_number": "NV-SFP10G-SR", "revision": "A",
+        "serial": "NS%05d%02d" % (card, port), "oui": "00:90:fa", "date_code": "250612",
+        "wavelength": 850,
+        "diagnostics": {"temperature": 35 + (card + port) % 10, "vcc": 3.3, "tx_bias_ma": 6.5,
+                        "tx_power_mw": 0.55, "rx_power_mw": 0.48},
+    }
+
+
 def fcoe_function(card, port, args):
     fid = function_id(2, card, port)
     targets = []
@@ -64,7 +86,7 @@ def fcoe_function(card, port, args):
             "fc_id": "0x%06x" % (0x010000 + (t << 8)),
             "luns": [lun(card, port, t, n) for n in range(args.luns)],
         })
-    return {
+    function = {
         "kind": "fcoe", "port": port, "pci_function": 2 * args.ports + port,
         "mac": "00:90:fb:" + pairs(fid, 3),
         "wwpn": "10:00:00:90:fb:" + pairs(fid, 3),
@@ -74,6 +96,16 @@ def fcoe_function(card, port, args):
         "driver": {"name": "tavofc", "version": "12.8.351.29", "type": 3},
         "targets": targets,
     }
+    if port == 0:
+        function["vports"] = [{
+            "wwpn": "10:00:00:90:fc:" + pairs(fid, 3),
+            "wwnn": "20:00:00:90:fc:" + pairs(fid, 3),
+            "fc_id": "0x%06x" % ((fid + 1) & 0xFFFFFF),
+            "name": "vport-c%d" % card,
+        }]
+        function["driver_params"] = [{"name": "lun-queue-depth", "min": 1, "max": 128, "default": 30,
+                                      "current": 32, "help": "Max number of FCP commands queued to a LUN"}]
+    return function
 
 
 def iscsi_function(card, port, args):
@@ -125,10 +157,17 @@ def card(number, args):
         "temperature": 40 + number % 20,
         "firmware": {"operational": "10.2.370.19", "boot": "10.2.370.9"},
         "vpd": [["PN", "TV52%02dC-N1" % args.ports], ["EC", "A01"], ["SN", serial]],
-        "fru": [["MN", "Norvane"], ["PA", "TAVO simulated CNA"], ["SN", serial],
-                ["FW", "A1,V:10.2.370.19,D:2025-06-17"], ["CF", "64"]],
+        "fru": [["MN", "Norvane"], ["PA", "TAVO simulated CNA"], ["PN", "TV52%02dC-N1" % args.ports],
+                ["SN", serial], ["UU", "%032x" % (0x6a1f0c4e9b2d4d7a8e1c55f3a0b20000 + number)],
+                ["FW", "A1,V:10.2.370.19,D:2025-06-17"], ["FN", "FRU-52%02dC-01" % args.ports],
+                ["DM", "2425"], ["CF", "64"], ["RI", "1"]],
+        "event_log": [
+            {"module": "FCoE", "modes": {"ram": {"level": 5}, "uart": {"level": 9}}},
+            {"module": "NIC", "modes": {"ram": {"level": 8}}},
+        ],
         "features": [35, 201, 400, 430],
-        "ports": [{"link_up": True, "speed_mbps": 10000} for _ in range(args.ports)],
+        "ports": [{"link_up": True, "speed_mbps": 10000, "sff": sff(number, port)}
+                  for port in range(args.ports)],
         "functions": functions,
     }
 
@@ -146,7 +185,8 @@ def main(argv):
         value = getattr(args, name)
         if not low <= value <= high:
             parser.error("--%s must be between %d and %d" % (name, low, high))
-    site = {"library": {"version": "12.8.351.29"}, "cards": [card(c, args) for c in range(args.cards)]}
+    site = {"library": {"version": "12.8.351.29", "driver_params": DRIVER_PARAMS},
+            "cards": [card(c, args) for c in range(args.cards)]}
     text = json.dumps(site, indent=1) + "\n"
     if args.output == "-":
         sys.stdout.write(text)

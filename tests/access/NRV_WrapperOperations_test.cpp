@@ -266,6 +266,18 @@ TEST_F(StubLibrary, DISABLED_ACountBeyondTheBufferIsNotBelieved) {
   EXPECT_EQ("02-11-22-33-44-55", ports[0]);
 }
 
+TEST_F(StubLibrary, DISABLED_DriverParameterCountsAreHeldToTheRecordsGiven) {
+  std::vector<RM_DRIVER_PARAM> params;
+  // 1000 claimed after filling the 52 records there was room for.
+  EXPECT_EQ(0u, NRV_MethodWrapper::ReadDriverParams(local(), true, params));
+  EXPECT_EQ(52u, params.size());
+  EXPECT_EQ(51u, params.back().currentValue);
+  // Four thousand million asked for: not allocated, the call fails.
+  EXPECT_EQ(7u, NRV_MethodWrapper::ReadDriverParams(local(), false, params));
+  EXPECT_TRUE(params.empty());
+  EXPECT_EQ(1, m_log.count("ERROR: nrvcimGetDriverParams: RM_GetDriverParams call failed (a) (7)"));
+}
+
 TEST_F(StubLibrary, DISABLED_CoreDumpOfADeadPort) {
   const HBA_NAME dead{{0x02, 0x11, 0x22, 0x33, 0x44, 0x55, 0x00, 0x00}};
   EXPECT_EQ(0u, NRV_MethodWrapper::nrvcimGetCoreDump(dead, "dead"));

@@ -221,6 +221,24 @@ RM_STATUS LRM_GetDumpFileNames(HBA_NAME, void* buffer) {
 RM_STATUS LRM_Ini_GetRouteTable(HBA_NAME, void* buffer, HBA_UINT32* size) {
   return table(buffer, size, 40, sizeof(RM_ROUTE_ENTRY));
 }
+// Global driver parameters: success with a count beyond the records it was
+// given room for (every name filled to the last byte, no terminator).
+RM_STATUS LRM_GetDriverParamsGlobal(HBA_NAME, void* records, HBA_UINT32* count) {
+  auto* params = static_cast<RM_DRIVER_PARAM*>(records);
+  for (HBA_UINT32 i = 0; i < *count; ++i) {
+    std::memset(params[i].name, 'p', sizeof params[i].name);
+    std::memset(params[i].help, 'h', sizeof params[i].help);
+    params[i].currentValue = i;
+  }
+  *count = 1000;
+  return 0;
+}
+// A port's driver parameters: always "too small", asking for more than any
+// driver has.
+RM_STATUS LRM_GetDriverParams(HBA_NAME, void*, HBA_UINT32* count) {
+  *count = 0xFFFFFFFF;
+  return 7;
+}
 // Claims more ports than its buffer carries when asked for more room.
 RM_STATUS RM_ListDeadNicPorts(void* buffer, HBA_UINT32* size) {
   HBA_UINT32* count = static_cast<HBA_UINT32*>(buffer);
