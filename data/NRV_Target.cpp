@@ -92,7 +92,9 @@ uint32_t parseDeviceIdentifier(const uint8_t* page, size_t size, DeviceIdentifie
   return 0;
 }
 
-Target::Target(const Adapter& adapter, const HBA_FCPSCSIENTRY& entry) {
+Target::Target(const Adapter& adapter, const HBA_FCPSCSIENTRY& entry) : Target(adapter.getHbaApiName(), entry) {}
+
+Target::Target(const std::string& hbaApiName, const HBA_FCPSCSIENTRY& entry) {
   NRV_DATA_LOG(NRV_DBG, "Creating Target...");
   m_NodeName = plainName(entry.FcpId.NodeWWN);
   NRV_DATA_LOG(NRV_DBG, "Target NodeWWN: %s", m_NodeName.c_str());
@@ -102,10 +104,9 @@ Target::Target(const Adapter& adapter, const HBA_FCPSCSIENTRY& entry) {
   m_OSDeviceName = field(reinterpret_cast<const uint8_t*>(entry.ScsiId.OSDeviceName),
                          sizeof entry.ScsiId.OSDeviceName);
 
-  HbaAdapterHandle handle(adapter.getHbaApiName());
+  HbaAdapterHandle handle(hbaApiName);
   if (handle.get() == 0) {
-    NRV_DATA_LOG(NRV_ERR, "HBA_OpenAdapter failed, skipping Adapter %s",
-                 adapter.getHbaApiName().c_str());
+    NRV_DATA_LOG(NRV_ERR, "HBA_OpenAdapter failed, skipping Adapter %s", hbaApiName.c_str());
     throw std::runtime_error("HBA_OpenAdapter failed");
   }
   const HBA_WWN port = entry.FcpId.PortWWN;

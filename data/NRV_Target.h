@@ -38,6 +38,8 @@ uint32_t parseDeviceIdentifier(const uint8_t* page, size_t size, DeviceIdentifie
 class Target {
  public:
   Target(const Adapter& adapter, const HBA_FCPSCSIENTRY& entry);
+  // `hbaApiName`: the HBA API name of the adapter the entry was mapped on.
+  Target(const std::string& hbaApiName, const HBA_FCPSCSIENTRY& entry);
   Target(const Target&) = delete;
   Target& operator=(const Target&) = delete;
   virtual ~Target();

@@ -1,0 +1,102 @@
+#include "agent/Catalogue_Iscsi.h"
+
+#include "access/RM_Attributes.h"
+#include "agent/Association_Builder.h"
+#include "agent/Catalogue_Profiles.h"
+#include "agent/Catalogue_Services.h"
+#include "agent/San_Catalogue.h"
+#include "data/NRV_Data.h"
+#include "schema/Classes.h"
+
+namespace cimple {
+
+namespace {
+
+constexpr uint32 kIscsiTcpPort = 3260;
+
+template <class E>
+E* hosted(const Catalogue_Build& build) {
+  E* e = E::create(true);
+  const Host_Keys host = host_keys(build);
+  e->SystemCreationClassName.set(host.creation_class_name);
+  e->SystemName.set(host.name);
+  e->CreationClassName.set(E::static_meta_class.name);
+  return e;
+}
+
+void protocol_controller(Catalogue_Build& build, const Function_View& fn, Instance* ethernet_port) {
+  const std::string& id = fn.name();
+  auto* c = hosted<NRVTAVO_SCSIProtocolController>(build);
+  c->DeviceID.set(id);
+  c->Name.set(format_text("SCSI Protocol Controller:%s", id.c_str()));
+  c->ElementName.set(c->Name.value);
+  c->EnabledState.set(2);
+  Instance* controller = insert_instance(build.agent, c);
+  if (controller == nullptr) return;
+  associate<NRVTAVO_ProtocolControllerForPort>(build, id, controller, ethernet_port);
+  associate<NRVTAVO_SCSIProtocolControllerSystemDevice>(build, id, build.host, controller);
+}
+
+void network_endpoints(Catalogue_Build& build, const Function_View& fn, Instance* ethernet_port) {
+  const std::string& id = fn.name();
+  const std::string& address = fn.p.text(RM_PA_IPV4_ADDRESS);
+  auto* ip = hosted<NRVTAVO_IPProtocolEndpoint>(build);
+  // Documented as IPv4_<AdapterNumber>_<PortNumber>_<IPv4 Address>.
+  ip->Name.set(format_text("IPv4_%zu_%d_%s", fn.index, static_cast<int>(fn.port.getPortIndex()), address.c_str()));
+  ip->ElementName.set(format_text("IP Protocol Endpoint %s", address.c_str()));
+  ip->IPv4Address.set(address);
+  ip->Address.set(address);
+  ip->SubnetMask.set(fn.p.text(RM_PA_SUBNET_MASK));
+  ip->AddressType.set(1);
+  ip->ProtocolIFType.set(4096);
+  ip->EnabledState.set(2);
+  Instance* ip_endpoint = insert_instance(build.agent, ip);
+  if (ip_endpoint == nullptr) return;
+  associate<NRVTAVO_HostedIPAccessPoint>(build, id, build.host, ip_endpoint);
+  associate<NRVTAVO_IPProtocolEndpointSAPImplementation>(build, id, ethernet_port, ip_endpoint);
+  if (build.ip_service)
+    associate<NRVTAVO_IPConfigurationServiceAffectsElement>(build, id, ip_endpoint, build.ip_service);
+  if (address.empty() || address == "0.0.0.0") {
+    NRV_LOG(NRV_DBG, "ip not set skipping creating the instance for NRVTAVO_TCPProtocolEndpoint for %s", id.c_str());
+    return;
+  }
+  auto* tcp = hosted<NRVTAVO_TCPProtocolEndpoint>(build);
+  tcp->Name.set(format_text("NRV:TCP Endpoint:%s:%d", address.c_str(), static_cast<int>(kIscsiTcpPort)));
+  tcp->ElementName.set(iscsi_tcp_element_name(id));
+  tcp->PortNumber.set(kIscsiTcpPort);
+  tcp->EnabledState.set(2);
+  Instance* tcp_endpoint = insert_instance(build.agent, tcp);
+  if (tcp_endpoint == nullptr) return;
+  associate<NRVTAVO_TCPBindsToIP>(build, id, ip_endpoint, tcp_endpoint);
+  associate<NRVTAVO_HostedTCPAccesspoint>(build, id, build.host, tcp_endpoint);
+}
+
+}  // namespace
+
+int build_iscsi_functions(Catalogue_Build& build, const Function_View*) {
+  ProviderAgent& agent = build.agent;
+  if (!agent.m_pData) {
+    NRV_LOG(NRV_CRIT, "Could not locate the data pointer for iSCSI - Serious issue");
+    return 1;
+  }
+  if (!agent.m_pData->hasIscsiAdapter()) return 0;
+  Instance* initiator_profile = createRegisteredProfile(agent, Profile::kISCSIInitiator);
+  createRegisteredProfile(agent, Profile::kISCSIInitiatorPorts);
+  const auto& adapters = agent.m_pData->getAdapters();
+  for (size_t i = 0; i < adapters.size(); ++i) {
+    const Adapter& adapter = *adapters[i];
+    if (adapter.getAdapterType() != kiSCSIAdapterType) continue;
+    for (const auto& port : adapter.getPorts()) {
+      const Function_View fn(adapter, *port, i);
+      const auto found = build.ethernet_ports.find(fn.name());
+      if (found == build.ethernet_ports.end()) continue;  // its Ethernet port was refused (logged)
+      Instance* ethernet_port = found->second;
+      associate<NRVTAVO_iSCSIPortConformsToProfile>(build, fn.name(), initiator_profile, ethernet_port);
+      protocol_controller(build, fn, ethernet_port);
+      network_endpoints(build, fn, ethernet_port);
+    }
+  }
+  return 0;
+}
+
+}  // namespace cimple
