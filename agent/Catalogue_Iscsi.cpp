@@ -1,6 +1,6 @@
 #include "agent/Catalogue_Iscsi.h"
 
-#include "access/RM_Attributes.h"
+#include "access/RM_Api.h"
 #include "agent/Association_Builder.h"
 #include "agent/Catalogue_Profiles.h"
 #include "agent/Catalogue_Services.h"
@@ -37,16 +37,43 @@ void protocol_controller(Catalogue_Build& build, const Function_View& fn, Instan
   associate<NRVTAVO_SCSIProtocolControllerSystemDevice>(build, id, build.host, controller);
 }
 
+struct Iscsi_Address {
+  std::string address = "0.0.0.0";
+  std::string netmask;
+};
+
+std::string dotted(const RM_IP_ADDRESS& a) {
+  return format_text("%u.%u.%u.%u", a.address[0], a.address[1], a.address[2], a.address[3]);
+}
+
+// The iSCSI function's own IPv4 settings (its port attributes carry none).
+Iscsi_Address iscsi_address(const Function_View& fn) {
+  Iscsi_Address out;
+  HBA_NAME handle{};
+  if (!port_handle(fn.name(), handle, "iSCSI port Id2HBAName failed", "iSCSI port str2HBAName failed")) return out;
+  RM_NETWORK_SETTINGS settings{};
+  HBA_UINT32 size = sizeof settings;
+  const RM_STATUS status = LRM_Ini_GetNetworkProperties(handle, &settings, &size);
+  if (status != RM_STATUS_SUCCESS) {
+    NRV_LOG(NRV_ERR, "GetNetworkProperties failed for port %s with %d", fn.name().c_str(), static_cast<int>(status));
+    return out;
+  }
+  out.address = dotted(settings.ipv4Address);
+  out.netmask = dotted(settings.subnetMask);
+  return out;
+}
+
 void network_endpoints(Catalogue_Build& build, const Function_View& fn, Instance* ethernet_port) {
   const std::string& id = fn.name();
-  const std::string& address = fn.p.text(RM_PA_IPV4_ADDRESS);
+  const Iscsi_Address ipv4 = iscsi_address(fn);
+  const std::string& address = ipv4.address;
   auto* ip = hosted<NRVTAVO_IPProtocolEndpoint>(build);
   // Documented as IPv4_<AdapterNumber>_<PortNumber>_<IPv4 Address>.
   ip->Name.set(format_text("IPv4_%zu_%d_%s", fn.index, static_cast<int>(fn.port.getPortIndex()), address.c_str()));
   ip->ElementName.set(format_text("IP Protocol Endpoint %s", address.c_str()));
   ip->IPv4Address.set(address);
   ip->Address.set(address);
-  ip->SubnetMask.set(fn.p.text(RM_PA_SUBNET_MASK));
+  ip->SubnetMask.set(ipv4.netmask);
   ip->AddressType.set(1);
   ip->ProtocolIFType.set(4096);
   ip->EnabledState.set(2);

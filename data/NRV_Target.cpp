@@ -72,6 +72,7 @@ std::string plainName(const HBA_WWN& wwn) {
 }
 
 const char kUnknown[] = "Unknown";
+constexpr uint32_t kUnknownDeviceType = 0x1F;  // SPC: unknown or no device type
 
 }  // namespace
 
@@ -126,6 +127,9 @@ void Target::inquireStandard(HBA_HANDLE handle, const HBA_WWN& port) {
   if (status != HBA_STATUS_OK) {
     logFailure(status);
     m_Vendor = m_Product = m_Revision = kUnknown;
+    // Without an answer the unit's type is unknown, not "direct access":
+    // the catalogue must not present a tape or a controller as a volume.
+    m_DeviceType = kUnknownDeviceType;
     return;
   }
   m_DeviceType = b.response[0] & 0x1F;

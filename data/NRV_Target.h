@@ -51,6 +51,7 @@ class Target {
   const std::string& getOSDeviceName() const { return m_OSDeviceName; }
   uint64_t getBlockLength() const { return m_BlockLength; }
   uint64_t getLastLogicalBlockAddress() const { return m_LastLBA; }
+  // 0x1F (unknown) when the standard INQUIRY failed.
   uint32_t getDeviceType() const { return m_DeviceType; }
   const std::string& getVendor() const { return m_Vendor; }
   const std::string& getProduct() const { return m_Product; }
