@@ -3,8 +3,6 @@
 #include <exception>
 #include <iterator>
 
-#include "agent/Catalogue_Iscsi.h"
-
 namespace cimple {
 
 Instance* feature_transceiver(ProviderAgent&, const std::string&) { return nullptr; }
@@ -47,7 +45,7 @@ Feature_Row kFeatures[] = {
     {Feature::kDiagnostics, nullptr, "Diagnostic classes created", "Dignostic Test creation failed"},
     {Feature::kSrIov, nullptr, "SR-IOV classes created", "CreateNICSrIovClasses failed"},
     {Feature::kChannelManagement, nullptr, "MC parameters updated", "Updating MC parameters failed"},
-    {Feature::kIscsiCatalogue, build_iscsi_functions, "iSCSI discovery succesful", "iSCSI discovery failed"},
+    {Feature::kIscsiCatalogue, nullptr, "iSCSI discovery succesful", "iSCSI discovery failed"},
 };
 static_assert(std::size(kFeatures) == static_cast<size_t>(Feature::kIscsiCatalogue) + 1);
 

@@ -1,7 +1,10 @@
 #include "agent/Catalogue_Iscsi.h"
 
+#include <unordered_map>
+
 #include "access/RM_Api.h"
 #include "agent/Association_Builder.h"
+#include "agent/Catalogue_Features.h"
 #include "agent/Catalogue_Profiles.h"
 #include "agent/Catalogue_Services.h"
 #include "agent/San_Catalogue.h"
@@ -98,6 +101,9 @@ void network_endpoints(Catalogue_Build& build, const Function_View& fn, Instance
   associate<NRVTAVO_HostedTCPAccesspoint>(build, id, build.host, tcp_endpoint);
 }
 
+// The adapter build's last step is this unit's from the module's load on.
+const bool kRegistered = (set_feature_builder(Feature::kIscsiCatalogue, build_iscsi_functions), true);
+
 }  // namespace
 
 int build_iscsi_functions(Catalogue_Build& build, const Function_View*) {
@@ -109,14 +115,21 @@ int build_iscsi_functions(Catalogue_Build& build, const Function_View*) {
   if (!agent.m_pData->hasIscsiAdapter()) return 0;
   Instance* initiator_profile = createRegisteredProfile(agent, Profile::kISCSIInitiator);
   createRegisteredProfile(agent, Profile::kISCSIInitiatorPorts);
+  // The iSCSI functions' Ethernet ports, made earlier in this build, by DeviceID.
+  std::unordered_map<std::string, Instance*> ethernet_ports;
+  const Instance_Map& ports = agent.m_NRVTAVO_EthernetPort_map;
+  for (size_t i = 0; i < ports.size(); ++i) {
+    const auto* port = static_cast<const NRVTAVO_EthernetPort*>(ports[i]);
+    if (!port->DeviceID.null) ethernet_ports.emplace(port->DeviceID.value.str(), ports[i]);
+  }
   const auto& adapters = agent.m_pData->getAdapters();
   for (size_t i = 0; i < adapters.size(); ++i) {
     const Adapter& adapter = *adapters[i];
     if (adapter.getAdapterType() != kiSCSIAdapterType) continue;
     for (const auto& port : adapter.getPorts()) {
       const Function_View fn(adapter, *port, i);
-      const auto found = build.ethernet_ports.find(fn.name());
-      if (found == build.ethernet_ports.end()) continue;  // its Ethernet port was refused (logged)
+      const auto found = ethernet_ports.find(fn.name());
+      if (found == ethernet_ports.end()) continue;  // its Ethernet port was refused (logged)
       Instance* ethernet_port = found->second;
       associate<NRVTAVO_iSCSIPortConformsToProfile>(build, fn.name(), initiator_profile, ethernet_port);
       protocol_controller(build, fn, ethernet_port);

@@ -3,7 +3,7 @@
 #include <cstdlib>
 #include <fstream>
 
-#include "derivedObjects/Catalogue_Provider.h"
+#include "agent/Catalogue_Provider.h"
 #include "schema/Classes.h"
 
 namespace nrv_test {
@@ -18,10 +18,14 @@ nlohmann::json sample_site() {
 int run_over_site(const nlohmann::json& site, const std::string& child, const std::vector<std::string>& env) {
   const std::string path = sysroot() + "/site-" + child.substr(child.rfind('.') + 1) + ".json";
   write_file(path, site.dump(1));
-  std::vector<std::string> all = env;
-  all.push_back("NRV_SITE=" + path);
+  // The child inherits this process's environment, so the site is swapped
+  // there for the child's start.
+  const std::string sample = std::getenv("NRV_SITE");
+  setenv("NRV_SITE", path.c_str(), 1);
   const char* libraries = std::getenv("LD_LIBRARY_PATH");
-  return run_in_child(child, libraries ? libraries : "", all);
+  const int status = run_in_child(child, libraries ? libraries : "", env);
+  setenv("NRV_SITE", sample.c_str(), 1);
+  return status;
 }
 
 std::unique_ptr<ProviderSlot> load_san_catalogue() {
