@@ -53,7 +53,7 @@ Instance* fc_target_endpoint(San_Build& b, const std::string& initiator, const s
   return endpoint;
 }
 
-Logical_Unit fc_unit(const std::string& initiator, const Target& t) {
+Logical_Unit fc_unit(const Target& t) {
   Logical_Unit u;
   u.number = static_cast<uint32_t>(t.getFcpLun() >> 48) & 0x3FFF;
   u.device_type = t.getDeviceType();
@@ -64,8 +64,9 @@ Logical_Unit fc_unit(const std::string& initiator, const Target& t) {
   u.os_device = t.getOSDeviceName();
   u.block_size = t.getBlockLength();
   u.blocks = t.getBlockLength() ? t.getLastLogicalBlockAddress() + 1 : 0;
-  u.identifier = format_text("%s_%s_%016llX_%s", initiator.c_str(), t.getPortName().c_str(),
-                             static_cast<unsigned long long>(t.getFcpLun()), u.serial.c_str());
+  // The target port and the LUN name the unit whichever initiator reaches it.
+  u.identifier = format_text("%s_%016llX_%s_%s", t.getPortName().c_str(), static_cast<unsigned long long>(t.getFcpLun()),
+                             u.vendor.c_str(), u.serial.c_str());
   const DeviceIdentifier& id = t.getDeviceIdentifier();
   if (id.identifierLength > 0) u.designator = hex_of(id.identifier, id.identifierLength);
   return u;
@@ -86,7 +87,7 @@ void build_fc(San_Build& b, const San_Anchors& anchors, const San_Scan& scan) {
       NRV_LOG(NRV_DBG, "Creating classes for target %d of %d.", i, count);
       Instance* endpoint = fc_target_endpoint(b, fc.port_name, t.getPortName());
       NRV_LOG(NRV_DBG, "Target %d is of type %d.", i, static_cast<int>(t.getDeviceType()));
-      build_logical_unit(b, fc_unit(fc.port_name, t), Path_Kind::kFc, initiator, endpoint);
+      build_logical_unit(b, fc_unit(t), Path_Kind::kFc, initiator, endpoint);
     }
   }
 }

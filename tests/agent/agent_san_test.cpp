@@ -94,6 +94,24 @@ void check_target_removed(ProviderAgent& agent, const LogCapture&) {
               kTapeTarget);
 }
 
+// The first FCoE port's disk array is zoned to the second port too: its
+// endpoint and its units stay one each, every unit gaining a second path.
+void share_target(json& site) {
+  json& functions = site["cards"][0]["functions"];
+  functions[5]["targets"].push_back(functions[4]["targets"][0]);
+}
+
+void check_shared_target(ProviderAgent& agent, const LogCapture& log) {
+  EXPECT_EQ(count<NRVTAVO_SCSIProtocolEndpoint>(agent), 3u);
+  EXPECT_EQ(count<NRVTAVO_LocalHostedAccessPoint>(agent), 3u);
+  EXPECT_EQ(count<NRVTAVO_StorageVolume>(agent), 7u);
+  EXPECT_EQ(count<NRVTAVO_StorageVolumeSystemDevice>(agent), 7u);
+  EXPECT_EQ(count<NRVTAVO_SCSIInitiatorTargetStorageVolumePath>(agent), 9u);
+  EXPECT_EQ(count<NRVTAVO_SCSIArbitraryLogicalUnit>(agent), 4u);
+  EXPECT_EQ(count<NRVTAVO_SCSIInitiatorTargetArbitraryLogicalUnitPath>(agent), 3u);
+  EXPECT_FALSE(log.contains("Insert Failed : m_NRVTAVO_StorageVolume_map"));
+}
+
 const Scenario kScenarios[] = {
     {"inquiry fails",
      json::parse(R"([{"function": "HBA_SendScsiInquiry", "status": 1, "lun": 1,
@@ -107,6 +125,7 @@ const Scenario kScenarios[] = {
     {"session listing fails", json::parse(R"([{"function": "RM_iSCSI_GetSessions", "status": 1, "call": 1}])"),
      nullptr, check_sessions_failed},
     {"target goes between rebuilds", json::array(), nullptr, check_target_removed},
+    {"one target port behind two initiators", json::array(), share_target, check_shared_target},
 };
 
 TEST(SanCatalogueTest, FaultsStayWithTheirItem) {
