@@ -13,6 +13,7 @@
 #include <cstdint>
 #include <string>
 
+#include "agent/Association_Builder.h"
 #include "agent/Catalogue_Build.h"
 #include "agent/San_Maps.h"
 
@@ -29,9 +30,6 @@ struct San_Build {
 // Inserts `instance` into its staging map, or answers the instance already
 // there with the same keys (the new one is destroyed); `fresh` tells which.
 Instance* san_insert(Instance_Map& map, Instance* instance, bool& fresh);
-
-template <class A>
-A* san_associate(San_Build& b, const std::string& label, const Instance* first, const Instance* second);
 
 // What the catalogue knows of one logical unit.
 struct Logical_Unit {
@@ -55,12 +53,7 @@ Instance* build_logical_unit(San_Build& b, const Logical_Unit& unit, Path_Kind k
 // "Storage Volume: %d", "Tape Drive %d", ... for the unit's device type.
 std::string device_name_text(uint32_t device_type, uint32_t number);
 
-}  // namespace cimple
-
-#include "agent/Association_Builder.h"
-
-namespace cimple {
-
+// Links two instances through A in A's staging map (Association_Builder.h).
 template <class A>
 A* san_associate(San_Build& b, const std::string& label, const Instance* first, const Instance* second) {
   return static_cast<A*>(

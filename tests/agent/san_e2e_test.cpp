@@ -7,22 +7,10 @@
 #include <string>
 #include <vector>
 
-#include "host/CimClient.h"
+#include "CimReply.h"
 
 namespace nrv_test {
 namespace {
-
-struct Reply {
-  int status;
-  std::string out, err;
-};
-
-Reply cim(std::vector<std::string> args) {
-  args.insert(args.begin(), {"-m", std::getenv("NRV_MODULE")});
-  std::ostringstream out, err;
-  const int status = nrv::host::runCimClient(args, out, err);
-  return {status, out.str(), err.str()};
-}
 
 std::vector<std::string> lines(const std::string& text) {
   std::vector<std::string> out;
