@@ -1,6 +1,6 @@
 // The catalogue builders the data-fetch thread runs with m_DataMutex held:
-// updateAdapterMaps after the adapter data set is rebuilt, updateSANMaps
-// after SAN discovery; and the release of diagnostic jobs at the agent's end.
+// updateAdapterMaps after the adapter data set is rebuilt, the SAN steps
+// after it; and the release of diagnostic jobs at the agent's end.
 // Each empties its maps first and then fills them in its fixed order.
 #include <exception>
 
@@ -12,6 +12,8 @@
 #include "agent/Catalogue_Services.h"
 #include "agent/Catalogue_Software.h"
 #include "agent/Catalogue_VNIC.h"
+#include "agent/San_Catalogue.h"
+#include "data/NRV_SanScan.h"
 #include "agent/NRVTAVO_ProviderConfigSetting_Provider.h"
 #include "agent/ProviderAgent.h"
 #include "data/NRV_Data.h"
@@ -111,9 +113,39 @@ int ProviderAgent::updateAdapterMaps() {
   return build_adapter_catalogue(build);
 }
 
+void ProviderAgent::buildSANData() {
+  m_SANRebuild = std::make_unique<San_Rebuild>();
+  {
+    std::lock_guard<std::recursive_mutex> data(m_DataMutex);
+    if (!m_pData) return;
+    m_SANRebuild->scan = San_Scan::plan(*m_pData);
+  }
+  m_SANRebuild->scan.run();
+}
+
 void ProviderAgent::updateSANMaps() {
-  clearSANMaps();
-  // SCSI targets, logical units and their paths are inserted here.
+  if (!m_SANRebuild) return;
+  std::unique_ptr<San_Anchors> anchors;
+  {
+    std::lock_guard<std::recursive_mutex> data(m_DataMutex);
+    anchors = collect_san_anchors(*this, m_SANRebuild->scan);
+  }
+  build_san_catalogue(*this, *anchors, m_SANRebuild->scan, m_SANRebuild->maps);
+  m_SANRebuild->built = true;
+}
+
+void ProviderAgent::publishSANMaps() {
+  // Without a finished build the SAN maps are emptied, never left stale.
+  if (!m_SANRebuild) {
+    clearSANMaps();
+    return;
+  }
+  if (m_pData) m_SANRebuild->scan.publish(*m_pData);
+  if (!m_SANRebuild->built) {
+    clearSANMaps();
+    return;
+  }
+  publish_san_maps(*this, m_SANRebuild->maps);
 }
 
 void ProviderAgent::releaseDiagnosticJobs() {

@@ -12,7 +12,9 @@
 #include "access/NRV_Runtime_Loader.h"
 #include "logging/NRV_SystemPaths.h"
 #include "access/RM_Api.h"
+#include "agent/San_Catalogue.h"
 #include "data/NRV_Data.h"
+#include "data/NRV_SanScan.h"
 #include "logging/CLogger.h"
 #include "logging/Log.h"
 #include "schema/Classes.h"
@@ -31,15 +33,14 @@ void default_build_adapter_data(ProviderAgent& agent) {
   if (agent.m_pData) agent.m_pData->buildAdapterData();
 }
 void default_update_adapter_maps(ProviderAgent& agent) { agent.updateAdapterMaps(); }
-void default_build_san_data(ProviderAgent& agent) {
-  if (agent.m_pData) agent.m_pData->buildSANData();
-}
+void default_build_san_data(ProviderAgent& agent) { agent.buildSANData(); }
 void default_update_san_maps(ProviderAgent& agent) { agent.updateSANMaps(); }
+void default_publish_san_maps(ProviderAgent& agent) { agent.publishSANMaps(); }
 void default_release_diagnostic_jobs(ProviderAgent& agent) { agent.releaseDiagnosticJobs(); }
 
 constexpr Catalogue_Builders kDefaultBuilders = {default_build_adapter_data, default_update_adapter_maps,
                                                  default_build_san_data, default_update_san_maps,
-                                                 default_release_diagnostic_jobs};
+                                                 default_publish_san_maps, default_release_diagnostic_jobs};
 // Constant-initialised, so ready before any static initialiser could load a provider.
 Catalogue_Builders s_Builders = kDefaultBuilders;  // guarded by s_AgentMutex
 

@@ -46,17 +46,28 @@ namespace cimple {
 class Data;
 class NRV_MethodWrapper;
 class ProviderAgent;
+struct San_Rebuild;
 
 // The steps of a data fetch that fill the data set and the maps, and the
 // release of diagnostic jobs at destruction.  The defaults are the agent's
-// own builders; a test installs others with ProviderAgent::useBuilders.
-// Each runs with m_DataMutex held and must not throw (a throw is caught and
-// logged; the fetch still completes its flag updates).
+// own builders; a test installs others with ProviderAgent::useBuilders; a
+// null step is skipped.  None may throw (a throw is caught and logged; the
+// fetch still completes its flag updates).
+// - build_adapter_data, update_adapter_maps, release_diagnostic_jobs:
+//   m_DataMutex held.
+// - build_san_data, update_san_maps: no agent lock held.  They do the slow
+//   part of the SAN rebuild (SCSI and management-library I/O, building the
+//   SAN instances aside) and take m_DataMutex themselves only for the
+//   moments they read the data set or the adapter maps, so that no reader
+//   waits for a slow logical unit.
+// - publish_san_maps: m_SANMapsReadyMutex and m_DataMutex held; puts what the
+//   two steps before it prepared in place, and must be quick.
 struct Catalogue_Builders {
   void (*build_adapter_data)(ProviderAgent& agent);
   void (*update_adapter_maps)(ProviderAgent& agent);
   void (*build_san_data)(ProviderAgent& agent);
   void (*update_san_maps)(ProviderAgent& agent);
+  void (*publish_san_maps)(ProviderAgent& agent);
   void (*release_diagnostic_jobs)(ProviderAgent& agent);
 };
 
@@ -112,7 +123,11 @@ class ProviderAgent {
   // updateAdapterMaps answers 0, or 32769 when a failure ended the build
   // early (what was built stays; the fetch marks the maps ready either way).
   int updateAdapterMaps();
+  // The SAN part, in the three steps of Catalogue_Builders: discovery and
+  // building aside with no lock held, then the quick publication.
+  void buildSANData();
   void updateSANMaps();
+  void publishSANMaps();
   // Hands every diagnostic job to its clean-up; run by the destructor with
   // m_DataMutex held.
   void releaseDiagnosticJobs();
@@ -183,6 +198,8 @@ class ProviderAgent {
   // never takes m_BuildMutex inside a ready lock).
   std::atomic<bool> m_bIsDataFetchRunning{false};
   std::atomic<bool> m_bOwnComputerSystem{false};
+  // The SAN rebuild between its steps; the data-fetch thread's alone.
+  std::unique_ptr<San_Rebuild> m_SANRebuild;
 
  private:
   // The agent, constructed if absent; the agent mutex held.

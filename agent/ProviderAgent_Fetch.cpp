@@ -5,6 +5,7 @@
 #include <exception>
 
 #include "agent/ProviderAgent.h"
+#include "agent/San_Catalogue.h"
 #include "logging/Log.h"
 
 namespace cimple {
@@ -198,34 +199,49 @@ void ProviderAgent::buildAdapterPart() {
   m_AdapterMapsReadyCond.notify_all();
 }
 
+// The SAN part keeps the flags, conditions and lock order of the adapter
+// part, but its slow steps (SCSI commands per logical unit, iSCSI listings,
+// building the instances) run with no lock that a reader needs: only the
+// publication holds m_SANMapsReadyMutex and m_DataMutex, for a swap of maps.
 void ProviderAgent::buildSANPart() {
-  std::unique_lock<std::mutex> data_ready(m_AdapterDataReadyMutex);
-  m_bBuildSANData = false;
   {
-    std::lock_guard<std::mutex> san_ready(m_SANMapsReadyMutex);
-    m_bIsSANMapsReady = false;
+    std::unique_lock<std::mutex> data_ready(m_AdapterDataReadyMutex);
+    m_bBuildSANData = false;
+    {
+      std::lock_guard<std::mutex> san_ready(m_SANMapsReadyMutex);
+      m_bIsSANMapsReady = false;
+    }
+    wait_for(data_ready, m_AdapterDataReadyCond, m_bIsAdapterDataReady, m_bIsDataFetchRunning);
   }
-  wait_for(data_ready, m_AdapterDataReadyCond, m_bIsAdapterDataReady, m_bIsDataFetchRunning);
   if (m_bIsLoaded) {
-    std::lock_guard<std::recursive_mutex> data(m_DataMutex);
     NRV_LOG(NRV_DBG, "PERF: Building SAN Data...");
     runStep(m_Builders.build_san_data, "buildSANData");
   }
-  std::unique_lock<std::mutex> maps_ready(m_AdapterMapsReadyMutex);
-  wait_for(maps_ready, m_AdapterMapsReadyCond, m_bIsAdapterMapsReady, m_bIsDataFetchRunning);
-  std::unique_lock<std::mutex> san_ready(m_SANMapsReadyMutex);
-  m_bIsSANMapsUpdating = true;
+  {
+    std::unique_lock<std::mutex> maps_ready(m_AdapterMapsReadyMutex);
+    wait_for(maps_ready, m_AdapterMapsReadyCond, m_bIsAdapterMapsReady, m_bIsDataFetchRunning);
+  }
+  {
+    std::lock_guard<std::mutex> san_ready(m_SANMapsReadyMutex);
+    m_bIsSANMapsUpdating = true;
+  }
   if (m_bIsLoaded) {
-    std::lock_guard<std::recursive_mutex> data(m_DataMutex);
     NRV_LOG(NRV_DBG, "PERF: Updating SAN Maps...");
     runStep(m_Builders.update_san_maps, "updateSANMaps");
   }
-  m_bIsSANMapsReady = true;
-  m_bIsSANMapsUpdating = false;
-  m_SANMapsReadyCond.notify_all();
-  san_ready.unlock();
-  maps_ready.unlock();
-  data_ready.unlock();
+  {
+    std::lock_guard<std::mutex> san_ready(m_SANMapsReadyMutex);
+    if (m_bIsLoaded) {
+      std::lock_guard<std::recursive_mutex> data(m_DataMutex);
+      runStep(m_Builders.publish_san_maps, "publishSANMaps");
+    }
+    m_bIsSANMapsReady = true;
+    m_bIsSANMapsUpdating = false;
+    m_SANMapsReadyCond.notify_all();
+  }
+  // The previous catalogue, now in the staging maps, is released here,
+  // outside every lock.
+  m_SANRebuild.reset();
 }
 
 }  // namespace cimple

@@ -106,7 +106,18 @@ void Port::rescanTargets(Adapter& adapter) {
     return;
   }
   freeTargets();
-  const std::string& hbaName = adapter.getHbaApiName();
+  m_Targets = scanTargets(adapter.getHbaApiName());
+}
+
+bool Port::scansTargets() const { return m_Kind.scansTargets; }
+
+void Port::replaceTargets(std::vector<std::unique_ptr<Target>> targets) {
+  freeTargets();
+  m_Targets = std::move(targets);
+}
+
+std::vector<std::unique_ptr<Target>> Port::scanTargets(const std::string& hbaName) {
+  std::vector<std::unique_ptr<Target>> targets;
   NRV_DATA_LOG(NRV_DBG, "TAVOadaptername:%s", hbaName.c_str());
   HbaAdapterHandle handle(hbaName);
   if (handle.get() == 0) {
@@ -122,16 +133,17 @@ void Port::rescanTargets(Adapter& adapter) {
     mapping.reset();
   }
   if (status == HBA_STATUS_OK && entries > 0) {
-    m_Targets.reserve(entries);
+    targets.reserve(entries);
     for (size_t i = 0; i < entries; ++i) {
       try {
-        m_Targets.push_back(std::make_unique<Target>(adapter, mapping->entry(i)));
+        targets.push_back(std::make_unique<Target>(hbaName, mapping->entry(i)));
       } catch (...) {
         NRV_DATA_LOG(NRV_ERR, "target creation failed - moving to the next target");
       }
     }
   }
-  NRV_DATA_LOG(NRV_DBG, "Number of targets:%d", static_cast<int>(m_Targets.size()));
+  NRV_DATA_LOG(NRV_DBG, "Number of targets:%d", static_cast<int>(targets.size()));
+  return targets;
 }
 
 const std::vector<std::unique_ptr<Target>>& Port::getTargets() const { return m_Targets; }

@@ -45,6 +45,14 @@ class Port {
   // throws std::runtime_error when the adapter's HBA API handle cannot be
   // opened.  NIC and iSCSI ports have no targets.
   virtual void rescanTargets(Adapter& adapter);
+  // The target mapping of the HBA API adapter `hbaApiName` with each entry
+  // interrogated; no port state is touched, so it may run without the data
+  // lock.  Throws std::runtime_error when the adapter cannot be opened.
+  static std::vector<std::unique_ptr<Target>> scanTargets(const std::string& hbaApiName);
+  // Destroys the current targets and keeps `targets` (data lock held).
+  void replaceTargets(std::vector<std::unique_ptr<Target>> targets);
+  // FC and FCoE ports find targets behind them; NIC and iSCSI ports do not.
+  bool scansTargets() const;
   virtual const std::vector<std::unique_ptr<Target>>& getTargets() const;
   // Throws std::exception for an index at or past the end.
   virtual Target* getTarget(size_t index) const;

@@ -72,6 +72,7 @@ std::string plainName(const HBA_WWN& wwn) {
 }
 
 const char kUnknown[] = "Unknown";
+constexpr uint32_t kUnknownDeviceType = 0x1F;  // SPC: unknown or no device type
 
 }  // namespace
 
@@ -92,7 +93,9 @@ uint32_t parseDeviceIdentifier(const uint8_t* page, size_t size, DeviceIdentifie
   return 0;
 }
 
-Target::Target(const Adapter& adapter, const HBA_FCPSCSIENTRY& entry) {
+Target::Target(const Adapter& adapter, const HBA_FCPSCSIENTRY& entry) : Target(adapter.getHbaApiName(), entry) {}
+
+Target::Target(const std::string& hbaApiName, const HBA_FCPSCSIENTRY& entry) {
   NRV_DATA_LOG(NRV_DBG, "Creating Target...");
   m_NodeName = plainName(entry.FcpId.NodeWWN);
   NRV_DATA_LOG(NRV_DBG, "Target NodeWWN: %s", m_NodeName.c_str());
@@ -102,10 +105,9 @@ Target::Target(const Adapter& adapter, const HBA_FCPSCSIENTRY& entry) {
   m_OSDeviceName = field(reinterpret_cast<const uint8_t*>(entry.ScsiId.OSDeviceName),
                          sizeof entry.ScsiId.OSDeviceName);
 
-  HbaAdapterHandle handle(adapter.getHbaApiName());
+  HbaAdapterHandle handle(hbaApiName);
   if (handle.get() == 0) {
-    NRV_DATA_LOG(NRV_ERR, "HBA_OpenAdapter failed, skipping Adapter %s",
-                 adapter.getHbaApiName().c_str());
+    NRV_DATA_LOG(NRV_ERR, "HBA_OpenAdapter failed, skipping Adapter %s", hbaApiName.c_str());
     throw std::runtime_error("HBA_OpenAdapter failed");
   }
   const HBA_WWN port = entry.FcpId.PortWWN;
@@ -125,6 +127,9 @@ void Target::inquireStandard(HBA_HANDLE handle, const HBA_WWN& port) {
   if (status != HBA_STATUS_OK) {
     logFailure(status);
     m_Vendor = m_Product = m_Revision = kUnknown;
+    // Without an answer the unit's type is unknown, not "direct access":
+    // the catalogue must not present a tape or a controller as a volume.
+    m_DeviceType = kUnknownDeviceType;
     return;
   }
   m_DeviceType = b.response[0] & 0x1F;

@@ -38,6 +38,8 @@ uint32_t parseDeviceIdentifier(const uint8_t* page, size_t size, DeviceIdentifie
 class Target {
  public:
   Target(const Adapter& adapter, const HBA_FCPSCSIENTRY& entry);
+  // `hbaApiName`: the HBA API name of the adapter the entry was mapped on.
+  Target(const std::string& hbaApiName, const HBA_FCPSCSIENTRY& entry);
   Target(const Target&) = delete;
   Target& operator=(const Target&) = delete;
   virtual ~Target();
@@ -49,6 +51,7 @@ class Target {
   const std::string& getOSDeviceName() const { return m_OSDeviceName; }
   uint64_t getBlockLength() const { return m_BlockLength; }
   uint64_t getLastLogicalBlockAddress() const { return m_LastLBA; }
+  // 0x1F (unknown) when the standard INQUIRY failed.
   uint32_t getDeviceType() const { return m_DeviceType; }
   const std::string& getVendor() const { return m_Vendor; }
   const std::string& getProduct() const { return m_Product; }

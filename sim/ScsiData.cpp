@@ -117,9 +117,10 @@ void copy_reply(const std::vector<uint8_t>& from, void* buffer, uint32_t size) {
 }
 
 uint64_t fcp_lun(uint32_t lun) {
-  // SAM: LUNs below 256 use peripheral addressing, larger ones flat space.
+  // SAM: LUNs below 256 use peripheral device addressing, larger ones flat
+  // space; the site loader refuses LUNs that neither can carry.
   if (lun < 256) return static_cast<uint64_t>(lun) << 48;
-  return (static_cast<uint64_t>(0x4000 | (lun & 0x3FFF))) << 48;
+  return (static_cast<uint64_t>(0x4000 | lun)) << 48;
 }
 
 std::optional<uint32_t> scsi_lun(uint64_t fcp) {

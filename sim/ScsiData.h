@@ -28,7 +28,10 @@ ScsiReply scsi_no_such_lun();
 // Copies as much of `from` as fits; clears the rest of the buffer.
 void copy_reply(const std::vector<uint8_t>& from, void* buffer, uint32_t size);
 
-// The FCP LUN field for a SCSI LUN (single-level, peripheral or flat space).
+// The largest LUN a single-level SAM LUN field carries (flat space addressing).
+inline constexpr uint32_t kMaxFlatSpaceLun = 16383;
+// The FCP LUN field of `lun` (at most kMaxFlatSpaceLun): single level,
+// peripheral device addressing below 256, flat space above.
 uint64_t fcp_lun(uint32_t lun);
 // Inverse of fcp_lun; nullopt for a field this site never hands out.
 std::optional<uint32_t> scsi_lun(uint64_t fcp);

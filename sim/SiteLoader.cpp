@@ -9,6 +9,7 @@
 
 #include <nlohmann/json.hpp>
 
+#include "sim/ScsiData.h"
 #include "sim/SiteJson.h"
 
 namespace nrvsim {
@@ -70,6 +71,9 @@ VpdEntries read_vpd(const Node& parent, const char* key) {
 ScsiUnit read_unit(const Node& n, uint32_t default_lun) {
   ScsiUnit u;
   u.lun = n.u32("lun", default_lun);
+  // The LUN travels in the 8-byte SAM LUN field, single level: peripheral
+  // device addressing below 256, flat space addressing up to 16383.
+  if (u.lun > kMaxFlatSpaceLun) n.at("lun").fail("LUN must be 0 to 16383 (SAM flat space addressing)");
   const uint32_t type = n.u32("type", 0);
   if (type > 0x1F) n.at("type").fail("peripheral device type must be 0 to 31");
   u.device_type = static_cast<uint8_t>(type);
@@ -331,9 +335,11 @@ Function read_function(const Node& n, const Card& card) {
   }
   if (f.kind == Kind::kFcoe) {
     uint32_t scsi_target = 0;
+    std::set<Wwn> target_ports;
     for (const Node& t : n.items("targets")) {
       FcTarget target;
       target.wwpn = t.wwn("wwpn");
+      if (!target_ports.insert(target.wwpn).second) t.at("wwpn").fail("two targets with one WWPN on a port");
       target.wwnn = t.has("wwnn") ? t.wwn("wwnn") : target.wwpn;
       target.fc_id = t.u32("fc_id", 0);
       target.scsi_target = t.u32("scsi_target", scsi_target);

@@ -209,7 +209,8 @@ void FakeCatalogue::reset() {
 }
 
 Catalogue_Builders FakeCatalogue::builders() {
-  return {fake_build_adapter_data, fake_update_adapter_maps, fake_build_san_data, fake_update_san_maps,
+  // The fake SAN maps are filled where the real ones are published.
+  return {fake_build_adapter_data, fake_update_adapter_maps, fake_build_san_data, nullptr, fake_update_san_maps,
           fake_release_jobs};
 }
 

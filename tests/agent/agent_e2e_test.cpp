@@ -10,22 +10,10 @@
 
 #include "AgentTestSupport.h"
 #include "agent/NrvConfigFile.h"
-#include "host/CimClient.h"
+#include "CimReply.h"
 
 namespace nrv_test {
 namespace {
-
-struct Reply {
-  int status;
-  std::string out, err;
-};
-
-Reply cim(std::vector<std::string> args) {
-  args.insert(args.begin(), {"-m", std::getenv("NRV_MODULE")});
-  std::ostringstream out, err;
-  const int status = nrv::host::runCimClient(args, out, err);
-  return {status, out.str(), err.str()};
-}
 
 const std::string kTimeout = "NRVTAVO_ProviderConfigSetting.InstanceID=\"Norvane TAVO Provider:cachetimeout\"";
 const std::string kSanRefresh = "NRVTAVO_ProviderConfigSetting.InstanceID=\"Norvane TAVO Provider:sanrefresh\"";

@@ -62,7 +62,8 @@ const Fault_Case kFaults[] = {
      "NRVTAVO_FCConcreteIdentity", 1, "NRVTAVO_FCPort", 2},
     {"hba_attributes_one", R"({"function": "LRM_GetHBAAttributes", "status": 190, "adapter": "00:90:fa:71:b4:03:00:00"})",
      "NRVTAVO_EthernetPort", 7, "NRVTAVO_Card", 2},
-    {"port_attributes", R"({"function": "LRM_GetPortAttributes", "status": 5})", "NRVTAVO_IPProtocolEndpoint", 0,
+    // The iSCSI functions' IP endpoints come from their network properties.
+    {"port_attributes", R"({"function": "LRM_GetPortAttributes", "status": 5})", "NRVTAVO_IPProtocolEndpoint", 2,
      "NRVTAVO_FCPortStatistics", 2},
     {"beacon", R"({"function": "RM_DiagBeaconState", "status": 5})", "NRVTAVO_EthernetPort", 8, "NRVTAVO_RecordLog",
      2},

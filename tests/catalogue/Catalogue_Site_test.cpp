@@ -22,9 +22,10 @@ constexpr const char* kNs = "root/norvane";
 // The sample site: card NV52C4213A07719 with two physical ports, each with a
 // NIC, an iSCSI and an FCoE function; card NV41T5120A03342 with four NIC
 // functions on four physical ports.  Five NIC functions have an IPv4 address
-// (three static, two by DHCP), three a gateway.  The module makes the host.
+// (three static, two by DHCP), three a gateway; both iSCSI functions have
+// an IP endpoint of their own and the iSCSI profiles.  The module makes the host.
 const std::map<std::string, size_t> kSampleCounts = {
-    {"NRVTAVO_RegisteredProfile", 14},
+    {"NRVTAVO_RegisteredProfile", 16},
     {"NRVTAVO_ComputerSystemConformsToProfile", 11},
     {"NRVTAVO_ProviderConfigSetting", 3},
     {"NRVTAVO_SoftwareInstallationService", 1},
@@ -85,14 +86,14 @@ const std::map<std::string, size_t> kSampleCounts = {
     {"NRVTAVO_PCIElementConformsToProfile", 10},
     {"NRVTAVO_IPConfigurationService", 1},
     {"NRVTAVO_HostedIPConfigurationService", 1},
-    {"NRVTAVO_IPProtocolEndpoint", 5},
+    {"NRVTAVO_IPProtocolEndpoint", 7},
     {"NRVTAVO_HostedIPProtocolEndpoint", 5},
     {"NRVTAVO_BindsToLANEndpoint", 5},
-    {"NRVTAVO_IPProtocolEndpointSAPImplementation", 5},
+    {"NRVTAVO_IPProtocolEndpointSAPImplementation", 7},
     {"NRVTAVO_IPProtocolEndpointConformsToProfile", 5},
     {"NRVTAVO_EnabledLogicalIPProtocolEndpointCapabilities", 5},
     {"NRVTAVO_IPProtocolEndpointCapabilities", 5},
-    {"NRVTAVO_IPConfigurationServiceAffectsElement", 5},
+    {"NRVTAVO_IPConfigurationServiceAffectsElement", 7},
     {"NRVTAVO_IPAssignmentSettingData", 5},
     {"NRVTAVO_RemoteServiceAccessPoint", 3},  // the gateways; no WebLaunch file
     {"NRVTAVO_RemoteAccessAvailableToElement", 3},

@@ -75,11 +75,12 @@ TEST_F(HbaApi, MappingTooSmallAnswersSevenWithTheCount) {
   auto* m = reinterpret_cast<HBA_FCPTARGETMAPPING*>(buf.data());
   m->NumberOfEntries = 1;
   EXPECT_EQ(SIM_CALL(hbaapi(), HBA_GetFcpTargetMapping, h, m), static_cast<HBA_STATUS>(HBA_STATUS_ERROR_MORE_DATA));
-  EXPECT_EQ(m->NumberOfEntries, 6u);
+  EXPECT_EQ(m->NumberOfEntries, 8u);
   const auto entries = mapping(h);
-  ASSERT_EQ(entries.size(), 6u);
+  ASSERT_EQ(entries.size(), 8u);
   EXPECT_EQ(entries[1].FcpId.FcpLun, static_cast<HBA_UINT64>(1ull << 48));
-  EXPECT_STREQ(entries[4].ScsiId.OSDeviceName, "/dev/st0");
+  EXPECT_EQ(entries[4].FcpId.FcpLun, static_cast<HBA_UINT64>((0x4000ull | 300) << 48));  // flat space
+  EXPECT_STREQ(entries[5].ScsiId.OSDeviceName, "/dev/st0");
 }
 
 TEST_F(HbaApi, StandardInquiryAndVpdPages) {
@@ -96,7 +97,7 @@ TEST_F(HbaApi, StandardInquiryAndVpdPages) {
   EXPECT_EQ(std::string(reinterpret_cast<char*>(rsp + 8), 8), "DGC     ");
   EXPECT_EQ(std::string(reinterpret_cast<char*>(rsp + 16), 16), "VRAID           ");
   EXPECT_EQ(std::string(reinterpret_cast<char*>(rsp + 32), 4), "0533");
-  ASSERT_EQ(inquiry(entries[4], 0, 0), 0u);
+  ASSERT_EQ(inquiry(entries[5], 0, 0), 0u);
   EXPECT_EQ(rsp[0] & 0x1F, 0x01);  // tape
   ASSERT_EQ(inquiry(entries[0], 1, 0x80), 0u);
   EXPECT_EQ(rsp[1], 0x80);
@@ -119,7 +120,7 @@ TEST_F(HbaApi, ReadCapacityIsBigEndianAndTapesRefuseIt) {
   const uint32_t block = (uint32_t{rsp[4]} << 24) | (rsp[5] << 16) | (rsp[6] << 8) | rsp[7];
   EXPECT_EQ(last, 2147483647u);  // 2^31 blocks
   EXPECT_EQ(block, 512u);
-  EXPECT_EQ(SIM_CALL(hbaapi(), HBA_SendReadCapacity, h, entries[4].FcpId.PortWWN, entries[4].FcpId.FcpLun, rsp,
+  EXPECT_EQ(SIM_CALL(hbaapi(), HBA_SendReadCapacity, h, entries[5].FcpId.PortWWN, entries[5].FcpId.FcpLun, rsp,
                      sizeof rsp, sense, sizeof sense),
             static_cast<HBA_STATUS>(HBA_STATUS_SCSI_CHECK_CONDITION));
   EXPECT_EQ(sense[0], 0x70);

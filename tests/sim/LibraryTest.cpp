@@ -222,7 +222,7 @@ TEST_F(ManagementLibrary, IscsiTargetListGrowsOnceAndAddedTargetsPersist) {
 
 TEST_F(ManagementLibrary, SessionInformationNamesTargetAndConnections) {
   const HBA_NAME port = first_of(RM_PROTOCOL_ISCSI);
-  std::vector<unsigned char> list(8 + 32);
+  std::vector<unsigned char> list(8 + 2 * 32);  // two sessions
   HBA_UINT32 size = static_cast<HBA_UINT32>(list.size());
   const char* target = "iqn.1992-08.com.netapp:sn.4082367740:vs.3";
   ASSERT_EQ(SIM_CALL(lrmapi(), LRM_iSCSI_GetSessions, port, target, list.data(), &size), 0u);

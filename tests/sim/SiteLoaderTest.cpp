@@ -124,6 +124,24 @@ TEST(SiteLoader, RefusesDuplicateLunsAndBadDeviceTypes) {
   EXPECT_NE(r.error.find("type"), std::string::npos) << r.error;
 }
 
+// A single-level SAM LUN field carries LUNs up to 16383 (flat space); larger
+// numbers would collapse onto one field and are refused, as are two targets
+// of one port name behind one port.
+TEST(SiteLoader, RefusesLunsNoAddressingCarriesAndSharedTargetNames) {
+  const std::string base =
+      R"({"cards":[{"model":"M","serial":"S","ports":[{}],"functions":[{"kind":"fcoe","mac":"00:90:fa:00:00:01",
+        "wwpn":"1000009000000001","targets":[{"wwpn":"5006016000000001","luns":)";
+  EXPECT_TRUE(load(base + R"([{"lun":255},{"lun":256},{"lun":16383}]}]}]}]})").ok);
+  for (const char* lun : {"16384", "65535", "4294967295"}) {
+    const LoadResult r = load(base + R"([{"lun":)" + lun + R"(}]}]}]}]})");
+    EXPECT_FALSE(r.ok) << lun;
+    EXPECT_NE(r.error.find("16383"), std::string::npos) << r.error;
+  }
+  const LoadResult twice = load(base + R"([]},{"wwpn":"50:06:01:60:00:00:00:01","luns":[]}]}]}]})");
+  EXPECT_FALSE(twice.ok);
+  EXPECT_NE(twice.error.find("WWPN"), std::string::npos) << twice.error;
+}
+
 TEST(SiteLoader, MissingFileIsAnErrorNotACrash) {
   const LoadResult r = load_site_file("/nonexistent/site.json");
   EXPECT_FALSE(r.ok);
