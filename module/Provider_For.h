@@ -3,7 +3,7 @@
 // specialisation (see module/Service_Providers.h).
 #pragma once
 
-#include "agent/Catalogue_Provider.h"
+#include "derivedObjects/Catalogue_Provider.h"
 
 namespace cimple {
 
