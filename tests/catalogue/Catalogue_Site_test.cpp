@@ -271,10 +271,12 @@ namespace {
 // The platform's Base Server profile references every profile of the module
 // but Profile Registration; without it there are no references.
 TEST(CatalogueWithPlatform, TheBaseServerProfileReferencesTheModulesProfiles) {
-  Host plain(Host::defaultModulePath(), Host::Options{std::nullopt});
-  Result none = plain.enumerateInstances(kNs, "NRVTAVO_BaseServerReferencedProfile");
-  ASSERT_TRUE(none.ok()) << none.errorText();
-  EXPECT_TRUE(none.instances.empty());
+  {
+    Host plain(Host::defaultModulePath(), Host::Options{std::nullopt});
+    Result none = plain.enumerateInstances(kNs, "NRVTAVO_BaseServerReferencedProfile");
+    ASSERT_TRUE(none.ok()) << none.errorText();
+    EXPECT_TRUE(none.instances.empty());
+  }
 
   Host host(Host::defaultModulePath(),
             Host::Options{std::string(NRV_HOST_TEST_DATA) + "/platform_base_server.json"});
