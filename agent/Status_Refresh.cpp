@@ -3,6 +3,7 @@
 #include <cstring>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "access/NRV_Common.h"
@@ -70,30 +71,30 @@ class Attribute_Blob {
   // The value of an integer attribute; logs `failure` (with the status) at
   // NRV_ERR when it cannot be read.
   std::optional<uint32_t> integer(uint16_t attribute, const char* failure) {
-    HBA_UINT16 length = 0;
-    HBA_UINT32 status = RM_STATUS_ERROR;
-    const void* value = RM_GetAttributeValue(bytes_.data(), attribute, &length, &status);
-    if (value == nullptr || status != RM_STATUS_SUCCESS) {
-      NRV_LOG(NRV_ERR, failure, static_cast<int>(status));
-      return std::nullopt;
-    }
+    const auto raw = value(attribute, failure);
+    if (!raw) return std::nullopt;
     uint32_t v = 0;
-    memcpy(&v, value, length < sizeof v ? length : sizeof v);
+    memcpy(&v, raw->data(), raw->size() < sizeof v ? raw->size() : sizeof v);
     return v;
   }
   std::optional<std::string> text(uint16_t attribute, const char* failure) {
-    HBA_UINT16 length = 0;
-    HBA_UINT32 status = RM_STATUS_ERROR;
-    const void* value = RM_GetAttributeValue(bytes_.data(), attribute, &length, &status);
-    if (value == nullptr || status != RM_STATUS_SUCCESS) {
-      NRV_LOG(NRV_ERR, failure, static_cast<int>(status));
-      return std::nullopt;
-    }
-    const char* chars = static_cast<const char*>(value);
-    return std::string(chars, strnlen(chars, length));
+    const auto raw = value(attribute, failure);
+    if (!raw) return std::nullopt;
+    return std::string(raw->data(), strnlen(raw->data(), raw->size()));
   }
 
  private:
+  std::optional<std::string_view> value(uint16_t attribute, const char* failure) {
+    HBA_UINT16 length = 0;
+    HBA_UINT32 status = RM_STATUS_ERROR;
+    const void* found = RM_GetAttributeValue(bytes_.data(), attribute, &length, &status);
+    if (found == nullptr || status != RM_STATUS_SUCCESS) {
+      NRV_LOG(NRV_ERR, failure, static_cast<int>(status));
+      return std::nullopt;
+    }
+    return std::string_view(static_cast<const char*>(found), length);
+  }
+
   std::vector<unsigned char> bytes_;
   RM_STATUS status_ = RM_STATUS_ERROR;
 };
@@ -124,6 +125,40 @@ void set_status(P* port, uint32_t state, bool fcoe) {
   const Port_Status status = port_status(state, fcoe);
   port->OperationalStatus.set({status.operational_status});
   port->StatusDescriptions.set({String(status.description)});
+}
+
+// The Ethernet port whose identifying entry `description` is `value`, or null.
+const NRVTAVO_EthernetPort* port_with(Instance_Map& ports, const char* description, const String& value) {
+  for (size_t p = 0; p < ports.size(); ++p) {
+    const auto* port = at<NRVTAVO_EthernetPort>(ports, p);
+    const String* entry = port ? identifying(*port, description) : nullptr;
+    if (entry && *entry == value) return port;
+  }
+  return nullptr;
+}
+
+constexpr const char* kPortKey = "SerialNumber:PhysicalPortNumber";
+
+struct Blob_Kind {
+  Blob_Read read;
+  HBA_UINT32 size;
+  const char* failure;
+};
+constexpr Blob_Kind kAdapterBlob{RM_GetHBAAttributes, RM_HBA_ATTRIBUTES_SIZE, "ERROR: RM_GetHBAAttributes call failed (%d)"};
+constexpr Blob_Kind kPortBlob{RM_GetPortAttributes, RM_PORT_ATTRIBUTES_SIZE, "ERROR: RM_GetPortAttributes call failed (%d)"};
+
+// One integer attribute of the function behind `port`, from a fresh blob of
+// `kind`; nullopt after logging what failed.
+std::optional<uint32_t> function_attribute(const NRVTAVO_EthernetPort& port, const Blob_Kind& kind, uint16_t attribute,
+                                           const char* failure) {
+  HBA_NAME handle{};
+  if (!handle_of(port.DeviceID.value, handle)) return std::nullopt;
+  Attribute_Blob blob(kind.read, handle, kind.size);
+  if (!blob.ok()) {
+    NRV_LOG(NRV_ERR, kind.failure, static_cast<int>(blob.status()));
+    return std::nullopt;
+  }
+  return blob.integer(attribute, failure);
 }
 
 // ---- Ethernet ports ------------------------------------------------------------
@@ -354,27 +389,13 @@ void UpdateBoardTemp(ProviderAgent& agent) {
   if (!pass_due(kBoard)) return;
   NRV_LOG(NRV_DBG, "PERF: UpdateBoardTemp");
   Instance_Map& cards = agent.m_NRVTAVO_Card_map;
-  Instance_Map& ports = agent.m_NRVTAVO_EthernetPort_map;
   for (size_t c = 0; c < cards.size(); ++c) {
     auto* card = at<NRVTAVO_Card>(cards, c);
-    if (card == nullptr) continue;
-    const NRVTAVO_EthernetPort* match = nullptr;
-    for (size_t p = 0; p < ports.size() && match == nullptr; ++p) {
-      const auto* port = at<NRVTAVO_EthernetPort>(ports, p);
-      const String* serial = port ? identifying(*port, "SerialNumber") : nullptr;
-      if (serial && *serial == card->SerialNumber.value) match = port;
-    }
-    if (match == nullptr) continue;  // the card keeps its value
-    HBA_NAME handle{};
-    std::optional<uint32_t> temperature;
-    if (handle_of(match->DeviceID.value, handle)) {
-      Attribute_Blob attributes(RM_GetHBAAttributes, handle, RM_HBA_ATTRIBUTES_SIZE);
-      if (!attributes.ok())
-        NRV_LOG(NRV_ERR, "ERROR: RM_GetHBAAttributes call failed (%d)", static_cast<int>(attributes.status()));
-      else
-        temperature = attributes.integer(RM_HA_BOARD_TEMPERATURE,
-                                         "ERROR: RM_GetttributeValue for _BoardTemperature call failed (%d)");
-    }
+    const NRVTAVO_EthernetPort* port =
+        card ? port_with(agent.m_NRVTAVO_EthernetPort_map, "SerialNumber", card->SerialNumber.value) : nullptr;
+    if (port == nullptr) continue;  // the card keeps its value
+    const auto temperature = function_attribute(*port, kAdapterBlob, RM_HA_BOARD_TEMPERATURE,
+                                                "ERROR: RM_GetttributeValue for _BoardTemperature call failed (%d)");
     if (!temperature) {
       NRV_LOG(NRV_ERR, "Error Updating Borad Temperature");
       return;
@@ -387,30 +408,15 @@ void UpdateBoardTemp(ProviderAgent& agent) {
 void UpdatePhyLinkDownReason(ProviderAgent& agent) {
   if (!pass_due(kPhy)) return;
   Instance_Map& controllers = agent.m_NRVTAVO_PortController_map;
-  Instance_Map& ports = agent.m_NRVTAVO_EthernetPort_map;
   for (size_t c = 0; c < controllers.size(); ++c) {
     auto* controller = at<NRVTAVO_PortController>(controllers, c);
-    const String* key = controller ? identifying(*controller, "SerialNumber:PhysicalPortNumber") : nullptr;
-    if (key == nullptr) continue;
+    const String* key = controller ? identifying(*controller, kPortKey) : nullptr;
     // The key names a physical port, not a function: the library is asked
     // through the first Ethernet function on that port.
-    const NRVTAVO_EthernetPort* port = nullptr;
-    for (size_t p = 0; p < ports.size() && port == nullptr; ++p) {
-      const auto* candidate = at<NRVTAVO_EthernetPort>(ports, p);
-      const String* port_key = candidate ? identifying(*candidate, "SerialNumber:PhysicalPortNumber") : nullptr;
-      if (port_key && *port_key == *key) port = candidate;
-    }
+    const NRVTAVO_EthernetPort* port = key ? port_with(agent.m_NRVTAVO_EthernetPort_map, kPortKey, *key) : nullptr;
     if (port == nullptr) continue;  // the controller keeps its value
-    HBA_NAME handle{};
-    std::optional<uint32_t> reason;
-    if (handle_of(port->DeviceID.value, handle)) {
-      Attribute_Blob attributes(RM_GetPortAttributes, handle, RM_PORT_ATTRIBUTES_SIZE);
-      if (!attributes.ok())
-        NRV_LOG(NRV_ERR, "ERROR: RM_GetPortAttributes call failed (%d)", static_cast<int>(attributes.status()));
-      else
-        reason = attributes.integer(RM_PA_PHY_LINK_DOWN_REASON,
-                                    "ERROR: RM_GetttributeValue for _PhyLinkDownReason call failed (%d)");
-    }
+    const auto reason = function_attribute(*port, kPortBlob, RM_PA_PHY_LINK_DOWN_REASON,
+                                           "ERROR: RM_GetttributeValue for _PhyLinkDownReason call failed (%d)");
     if (!reason) {
       NRV_LOG(NRV_ERR, "Error Updating Physical Link Down Reason");
       return;
