@@ -9,6 +9,8 @@
 // it is given.
 #pragma once
 
+#include <mutex>
+
 #include "agent/Catalogue_Maps.h"
 #include "framework/Provider.h"
 
@@ -24,5 +26,20 @@ using Map_Selector = Instance_Map& (*)(ProviderAgent& agent);
 
 // The enumeration of the catalogue-backed provider of class `class_name`.
 int enumerate_catalogue(const char* class_name, Map_Selector select, Catalogue catalogue, const Handler& handler);
+
+// What a refreshing provider runs on its map before it copies it: the
+// refresh operation, under the provider's own recursive mutex (which the
+// caller keeps alive for the life of the module).
+struct Status_Refresh {
+  void (*run)(ProviderAgent& agent);
+  std::recursive_mutex* own;
+};
+
+// The enumeration of an adapter-catalogue provider that refreshes first.
+// Nothing is delivered when the agent is not loaded ("RM Init failed for
+// <source>").  Locks, in order: adapter data ready, adapter maps ready,
+// m_DataMutex, the provider's own mutex (for the refresh only).
+int enumerate_refreshed(const char* class_name, const char* source, Map_Selector select, Status_Refresh refresh,
+                        const Handler& handler);
 
 }  // namespace cimple

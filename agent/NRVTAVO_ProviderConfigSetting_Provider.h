@@ -5,7 +5,8 @@
 // agent ends.  insertProviderConfigSettings builds the three instances.
 #pragma once
 
-#include "agent/Catalogue_Provider.h"
+#include "agent/Catalogue_Reader.h"
+#include "framework/Provider_Proc.h"
 #include "schema/NRVTAVO_ProviderConfigSetting.h"
 
 namespace cimple {
@@ -17,8 +18,14 @@ class ProviderAgent;
 // NRV_CRIT) when the map refuses one; the refused instance is destroyed.
 bool insertProviderConfigSettings(ProviderAgent& agent);
 
-class NRVTAVO_ProviderConfigSetting_Provider : public Catalogue_Provider<NRVTAVO_ProviderConfigSetting> {
+class NRVTAVO_ProviderConfigSetting_Provider : public Provider_Base {
  public:
+  int load() { return agent_load(); }
+  int unload() { return agent_unload("NRVTAVO_ProviderConfigSetting"); }
+  int enum_instances(const Instance*, const Handler& handler) {
+    return enumerate_catalogue("NRVTAVO_ProviderConfigSetting", &agent_map<NRVTAVO_ProviderConfigSetting>,
+                               Catalogue::Adapter, handler);
+  }
   // Changes the setting whose instance has the keys of `instance`, when the
   // model lists `current`: 0, MODIFY_INSTANCE_INVALID_PARAMETER for a missing
   // argument or an out-of-range value, MODIFY_INSTANCE_FAILED when there is

@@ -8,6 +8,7 @@
 #include <exception>
 
 #include "access/NRV_Common.h"
+#include "agent/Status_Refresh.h"
 #include "access/NRV_MethodWrapper.h"
 #include "access/NRV_Runtime_Loader.h"
 #include "logging/NRV_SystemPaths.h"
@@ -124,6 +125,8 @@ void ProviderAgent::construct() {
   logger.registerSink(&m_FileLogger);
   logger.registerSink(&m_CIMLogger);
   m_SysLogger.emplace(logger);
+  // A new agent has a new catalogue: its first reads refresh at once.
+  resetStatusRefreshTimes();
   try {
     m_ConfigFile.read(system_path(kNrvConfigFile));
 

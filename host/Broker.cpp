@@ -49,6 +49,8 @@ constexpr const char* kDefaultParents[][2] = {
     {"CIM_PhysicalPackage", "CIM_PhysicalElement"},
     {"CIM_PhysicalElement", "CIM_ManagedSystemElement"},
     {"CIM_ManagedSystemElement", "CIM_ManagedElement"},
+    {"PG_RegisteredProfile", "CIM_RegisteredProfile"},
+    {"CIM_RegisteredProfile", "CIM_ManagedElement"},
 };
 
 std::string principal() {

@@ -9,6 +9,7 @@
 #include <memory>
 #include <optional>
 
+#include "host/CimTree.h"
 #include "host/Host.h"
 #include "host/PathText.h"
 
@@ -90,7 +91,7 @@ std::variant<Command, UsageError> parseCommand(const std::vector<std::string>& a
       positional.push_back(a);
     }
   }
-  if (positional.empty()) return UsageError{"missing operation (ei ein gi ai ain ri rin ci mi di cm)"};
+  if (positional.empty()) return UsageError{"missing operation (ei ein gi ai ain ri rin ci mi di cm tree)"};
   c.op = positional[0];
   if (positional.size() < 2) return UsageError{"missing object path"};
   c.pathText = positional[1];
@@ -293,12 +294,29 @@ int opCallMethod(Host& h, const Command& c, const PathData& p, std::ostream& out
   return 0;
 }
 
+// tree <path> [depth=N] [AssocClass[:Role][,AssocClass[:Role]...] ...]
+int opTree(Host& h, const Command& c, const PathData& p, std::ostream& out, std::ostream& err) {
+  TreeOptions options;
+  for (const std::string& word : c.extra) {
+    if (word.rfind("depth=", 0) == 0) {
+      char* end = nullptr;
+      const long depth = std::strtol(word.c_str() + 6, &end, 10);
+      if (end == word.c_str() + 6 || *end != '\0' || depth < 0 || depth > 64)
+        return usage("tree: depth must be 0 to 64", err);
+      options.depth = static_cast<int>(depth);
+    } else {
+      for (std::string& assoc : splitCommas(word)) options.follow.push_back(std::move(assoc));
+    }
+  }
+  return printTree(h, p, options, out, err);
+}
+
 const std::map<std::string, Operation>& operations() {
   static const std::map<std::string, Operation> table = {
       {"ei", opEnumerate},      {"ein", opEnumerateNames},  {"gi", opGet},
       {"ai", opAssociators},    {"ain", opAssociatorNames}, {"ri", opReferences},
       {"rin", opReferenceNames}, {"ci", opCreate},          {"mi", opModify},
-      {"di", opDelete},         {"cm", opCallMethod},
+      {"di", opDelete},         {"cm", opCallMethod},       {"tree", opTree},
   };
   return table;
 }

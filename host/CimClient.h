@@ -3,7 +3,8 @@
 //
 //   nrv-cim [options] <op> <path> [Name=value ...]
 //   nrv-cim [options] cm <path> <Method> [Arg=value ...]   (or <Method>.Arg=value,Arg2=value)
-//   ops: ei ein gi ai ain ri rin ci mi di cm
+//   nrv-cim [options] tree <path> [depth=N] [AssocClass[:Role],...]   (see host/CimTree.h)
+//   ops: ei ein gi ai ain ri rin ci mi di cm tree
 //   values: "text", true/false, numbers, {a,b} arrays; Name:type=value gives the CIM type
 //   (uint16, string[], datetime, ref ...). Untyped method arguments are sent as strings;
 //   mi reads the types of the current instance. Default namespace "root/norvane".

@@ -16,12 +16,14 @@ using Json = nlohmann::json;
 
 struct PlatformClass {
   const char* name;
-  const char* keys[2];
+  const char* nameSpace;
+  const char* keys[2];  // a null entry ends the list early
 };
 
 constexpr PlatformClass kClasses[] = {
-    {"KVLD_ComputerSystem", {"CreationClassName", "Name"}},
-    {"KVLD_Chassis", {"CreationClassName", "Tag"}},
+    {"KVLD_ComputerSystem", kPlatformNameSpace, {"CreationClassName", "Name"}},
+    {"KVLD_Chassis", kPlatformNameSpace, {"CreationClassName", "Tag"}},
+    {"PG_RegisteredProfile", kInteropNameSpace, {"InstanceID", nullptr}},
 };
 
 const PlatformClass* platformClass(const std::string& name) {
@@ -126,7 +128,7 @@ PlatformProvider::PlatformProvider(const std::optional<std::string>& jsonPath) {
     for (const auto& entry : doc[cls.name]) {
       if (!entry.is_object()) continue;
       InstanceData inst;
-      inst.path.nameSpace = kPlatformNameSpace;
+      inst.path.nameSpace = cls.nameSpace;
       inst.path.className = cls.name;
       for (const auto& [name, value] : entry.items()) {
         auto d = toDatum(value);
@@ -137,6 +139,7 @@ PlatformProvider::PlatformProvider(const std::optional<std::string>& jsonPath) {
         setNamed(inst.properties, name, std::move(*d));
       }
       for (const char* key : cls.keys) {
+        if (key == nullptr) break;
         if (const Datum* v = findNamed(inst.properties, key)) inst.path.keys.emplace_back(key, *v);
       }
       instances_.push_back(std::move(inst));
@@ -145,7 +148,8 @@ PlatformProvider::PlatformProvider(const std::optional<std::string>& jsonPath) {
 }
 
 bool PlatformProvider::serves(const PathData& path) const {
-  return path.nameSpace == kPlatformNameSpace && platformClass(path.className) != nullptr;
+  const PlatformClass* cls = platformClass(path.className);
+  return cls != nullptr && path.nameSpace == cls->nameSpace;
 }
 
 Outcome PlatformProvider::serve(const Request& r) const {

@@ -1,12 +1,14 @@
 // PlatformProvider: the host's stand-in for the platform's own instrumentation — the
-// KVLD_ComputerSystem and KVLD_Chassis instances of namespace "root/kvlhost", read from a JSON
-// file.
+// KVLD_ComputerSystem and KVLD_Chassis instances of namespace "root/kvlhost" and the
+// platform's registered profiles (PG_RegisteredProfile, such as its Base Server profile) of
+// "root/pg_interop", read from a JSON file.
 //
-// File format: {"KVLD_ComputerSystem": [ {Prop: value, ...}, ... ], "KVLD_Chassis": [ ... ]}.
+// File format: {"KVLD_ComputerSystem": [ {Prop: value, ...}, ... ], "KVLD_Chassis": [ ... ],
+// "PG_RegisteredProfile": [ ... ]}.
 // A value is a JSON string, boolean or number (numbers become uint32 when they fit, else
 // sint64 or real64), an array of those, or {"type": "uint16", "value": ...} for an exact CIM
 // type ("uint16[]" for arrays, "datetime", ...). Keys are CreationClassName+Name (computer
-// system) and CreationClassName+Tag (chassis).
+// system), CreationClassName+Tag (chassis) and InstanceID (profiles).
 #ifndef NRV_HOST_PLATFORMPROVIDER_H
 #define NRV_HOST_PLATFORMPROVIDER_H
 
@@ -19,6 +21,7 @@
 namespace nrv::host {
 
 inline constexpr const char* kPlatformNameSpace = "root/kvlhost";
+inline constexpr const char* kInteropNameSpace = "root/pg_interop";
 
 class PlatformProvider {
  public:

@@ -7,7 +7,7 @@
 
 #include <type_traits>
 
-#include "agent/Catalogue_Provider.h"
+#include "derivedObjects/Catalogue_Provider.h"
 #include "schema/ProviderClasses.h"
 
 namespace cimple {

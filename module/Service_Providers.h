@@ -4,3 +4,5 @@
 #pragma once
 
 #include "agent/NRVTAVO_ProviderConfigSetting_Provider.h"
+#include "derivedObjects/NRVTAVO_BaseServerReferencedProfile_Provider.h"
+#include "derivedObjects/Refresh_Provider.h"

@@ -32,6 +32,10 @@ bool SimSite::load_locked(const std::string& path) {
   path_ = path;
   LoadResult r = load_site_file(path);
   handles_.clear();
+  {
+    std::lock_guard<std::mutex> counting(calls_mu_);
+    calls_.clear();
+  }
   if (!r.ok) {
     ready_ = false;
     error_ = r.error;
@@ -72,10 +76,23 @@ bool SimSite::reload(const std::string& path) {
 
 std::optional<uint32_t> SimSite::gate(std::string_view function, uint32_t unavailable,
                                       std::optional<Wwn> adapter, std::optional<uint32_t> lun) {
+  {
+    std::lock_guard<std::mutex> counting(calls_mu_);
+    const std::string_view op = FaultPlan::operation(function);
+    auto it = calls_.find(op);
+    if (it == calls_.end()) it = calls_.emplace(std::string(op), 0).first;
+    ++it->second;
+  }
   if (!ready()) return unavailable;
   // The plan has its own lock; the delay must not hold the site mutex, or a
   // slow call would stall every other thread of the process.
   return enact(faults_.on_call(CallSite{function, adapter, lun}));
+}
+
+uint64_t SimSite::calls(std::string_view function) {
+  std::lock_guard<std::mutex> counting(calls_mu_);
+  auto it = calls_.find(FaultPlan::operation(function));
+  return it == calls_.end() ? 0 : it->second;
 }
 
 uint32_t SimSite::open_handle(FunctionRef ref) {
@@ -117,3 +134,12 @@ std::optional<FunctionRef> find_instance(const Site& site, uint32_t instance) {
 }
 
 }  // namespace nrvsim
+
+extern "C" int nrvsim_reload(const char* path) {
+  nrvsim::SimSite& site = nrvsim::SimSite::instance();
+  return site.reload(path && *path ? std::string(path) : site.path()) ? 1 : 0;
+}
+
+extern "C" unsigned long long nrvsim_call_count(const char* function) {
+  return function ? nrvsim::SimSite::instance().calls(function) : 0;
+}

@@ -47,6 +47,10 @@ class NRVSIM_API SimSite {
                                std::optional<Wwn> adapter = std::nullopt,
                                std::optional<uint32_t> lun = std::nullopt);
 
+  // How many calls of `function`'s operation ("LRM_X", "RM_X" and "X" are
+  // one) have reached the site since it was loaded.
+  uint64_t calls(std::string_view function);
+
   // Runs f(Site&) under the site mutex and returns its result.  Callers call
   // gate() first; with() on an unloaded site sees an empty Site.
   template <class F>
@@ -73,6 +77,8 @@ class NRVSIM_API SimSite {
   Site site_;
   FaultPlan faults_;
   std::map<uint32_t, FunctionRef> handles_;
+  std::mutex calls_mu_;  // apart from mu_: counted on every call, before the site lock
+  std::map<std::string, uint64_t, std::less<>> calls_;
   uint32_t next_handle_ = 1;
 };
 
@@ -87,3 +93,13 @@ inline Card& card_of(Site& site, FunctionRef r) { return site.cards[r.card]; }
 const char* default_site_path();
 
 }  // namespace nrvsim
+
+// The control entry points a test uses to change the site between reads and
+// to see how often the module asked the library.
+extern "C" {
+// Replaces the site with the file at `path` (null or "": reads the current
+// site file again); 1 when the new site is loaded, else 0.
+NRVSIM_API int nrvsim_reload(const char* path);
+// Calls of `function`'s operation since the site was last loaded.
+NRVSIM_API unsigned long long nrvsim_call_count(const char* function);
+}

@@ -9,7 +9,7 @@
 #include <cerrno>
 
 #include "AgentFixture.h"
-#include "agent/Catalogue_Provider.h"
+#include "derivedObjects/Catalogue_Provider.h"
 #include "logging/Log.h"
 #include "schema/Classes.h"
 #include "tests/common/Special_Files.h"

@@ -11,7 +11,7 @@
 #include "AgentFixture.h"
 #include "logging/Log.h"
 #include "agent/Catalogue_Maps.h"
-#include "agent/Catalogue_Provider.h"
+#include "derivedObjects/Catalogue_Provider.h"
 #include "schema/Classes.h"
 #include "tests/common/Special_Files.h"
 

@@ -7,7 +7,7 @@
 #include <thread>
 
 #include "AgentFixture.h"
-#include "agent/Catalogue_Provider.h"
+#include "derivedObjects/Catalogue_Provider.h"
 #include "logging/CLogger.h"
 #include "logging/Log.h"
 #include "schema/NRVTAVO_Chip.h"

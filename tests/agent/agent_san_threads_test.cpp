@@ -6,7 +6,7 @@
 
 #include <thread>
 
-#include "agent/Catalogue_Provider.h"
+#include "derivedObjects/Catalogue_Provider.h"
 #include "logging/Log.h"
 #include "san_test_support.h"
 #include "schema/Classes.h"

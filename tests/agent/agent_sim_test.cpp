@@ -6,8 +6,9 @@
 
 #include "AgentTestSupport.h"
 #include "agent/NrvConfigFile.h"
+#include "agent/Status_Refresh.h"
 #include "data/NRV_Data.h"
-#include "agent/Catalogue_Provider.h"
+#include "derivedObjects/Catalogue_Provider.h"
 #include "logging/Log.h"
 #include "logging/NRV_LogDataFile.h"
 #include "module/Provider_For.h"
@@ -48,6 +49,47 @@ TEST(AgentSimTest, BuildsTheCatalogueFromTheSimulatedSite) {
   EXPECT_EQ(disk->unload(), UNLOAD_OK);
   EXPECT_EQ(ProviderAgent::peekInstance(), nullptr);
   EXPECT_EQ(capture.count("Norvane Provider Unloaded", NRV_INFO), 1);
+}
+
+// The driver-parameter refresh rewrites the current values of the instances it
+// finds, global ones from the driver's list and local ones from the port's.
+TEST(AgentSimTest, DriverParameterReadsRefreshTheCurrentValues) {
+  ProviderAgent::useBuilders(ProviderAgent::defaultBuilders());
+  using Provider = Provider_For<NRVTAVO_DriverParameterSettingData>::type;
+  auto settings = make_slot<Provider, NRVTAVO_DriverParameterSettingData>();
+  ASSERT_EQ(settings->load(), LOAD_OK);
+  ProviderAgent& agent = *ProviderAgent::peekInstance();
+  Collected first;
+  EXPECT_EQ(settings->enumerate(first), ENUM_INSTANCES_OK);
+  wait_fetch_idle(agent);
+  struct Row {
+    const char* id;
+    uint32 site_value;
+  };
+  const Row rows[] = {
+      {"NRV:FCoE Current Global Driver Parameter:lun-queue-depth", 30},
+      {"NRV:FCoE Current Local Driver Parameter:10000090FA5C2E12:lun-queue-depth", 32},
+      {"NRV:FCoE Maximum Global Driver Parameter:lun-queue-depth", 7},  // not a current value: kept
+  };
+  {
+    std::lock_guard<std::recursive_mutex> data(agent.m_DataMutex);
+    agent.m_NRVTAVO_DriverParameterSettingData_map.clear();
+    for (const Row& row : rows) {
+      auto* setting = NRVTAVO_DriverParameterSettingData::create(true);
+      setting->InstanceID.set(row.id);
+      setting->Value.set(7);
+      ASSERT_GE(agent.m_NRVTAVO_DriverParameterSettingData_map.insert(setting), 0);
+    }
+  }
+  resetStatusRefreshTimes();
+  Collected refreshed;
+  EXPECT_EQ(settings->enumerate(refreshed), ENUM_INSTANCES_OK);
+  ASSERT_EQ(refreshed.instances.size(), std::size(rows));
+  for (size_t i = 0; i < std::size(rows); ++i) {
+    auto* setting = static_cast<NRVTAVO_DriverParameterSettingData*>(refreshed.instances[i]);
+    EXPECT_EQ(setting->Value.value, rows[i].site_value) << rows[i].id;
+  }
+  EXPECT_EQ(settings->unload(), UNLOAD_OK);
 }
 
 }  // namespace

@@ -8,7 +8,7 @@
 
 #include "AgentFixture.h"
 #include "logging/Log.h"
-#include "agent/Catalogue_Provider.h"
+#include "derivedObjects/Catalogue_Provider.h"
 #include "schema/Classes.h"
 
 namespace nrv_test {

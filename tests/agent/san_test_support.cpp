@@ -3,7 +3,7 @@
 #include <cstdlib>
 #include <fstream>
 
-#include "agent/Catalogue_Provider.h"
+#include "derivedObjects/Catalogue_Provider.h"
 #include "schema/Classes.h"
 
 namespace nrv_test {

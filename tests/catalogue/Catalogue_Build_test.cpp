@@ -10,7 +10,7 @@
 #include "agent/Association_Builder.h"
 #include "agent/Catalogue_Features.h"
 #include "data/NRV_Data.h"
-#include "agent/Catalogue_Provider.h"
+#include "derivedObjects/Catalogue_Provider.h"
 #include "schema/Classes.h"
 
 namespace nrv_test {

@@ -106,3 +106,33 @@ TEST(CatalogueFaults, AnUnresolvableHostNameStillBuildsTheCatalogue) {
 }
 
 }  // namespace
+
+namespace {
+
+// nrv-cim's tree from the chassis: every card, chip, port controller and
+// port of the sample site once, each indented under the object that led to it.
+TEST(CatalogueTree, FromTheChassisEveryCardChipAndPortShowsOnce) {
+  const std::string chassis = "root/norvane:CIM_Chassis.CreationClassName=\"CIM_Chassis\",Tag=\"NRV TAVO:Chassis\"";
+  auto r = runClient({"tree", chassis,
+                      "NRVTAVO_ChassisContainsCard,NRVTAVO_CardContainsChip,NRVTAVO_CardRealizesPortController,"
+                      "NRVTAVO_ControlledBy,NRVTAVO_FCControlledBy"});
+  ASSERT_EQ(r.status, 0) << r.err;
+  auto count = [&](const std::string& what) {
+    size_t n = 0;
+    for (size_t at = r.out.find(what); at != std::string::npos; at = r.out.find(what, at + 1)) ++n;
+    return n;
+  };
+  EXPECT_EQ(r.out.rfind("CIM_Chassis Tag=\"NRV TAVO:Chassis\"", 0), 0u) << r.out;
+  EXPECT_EQ(count("] NRVTAVO_Card "), 2u) << r.out;
+  EXPECT_EQ(count("] NRVTAVO_Chip "), 2u);
+  EXPECT_EQ(count("] NRVTAVO_PortController "), 6u);
+  EXPECT_EQ(count("] NRVTAVO_EthernetPort "), 8u);
+  EXPECT_EQ(count("] NRVTAVO_FCPort "), 2u);
+  EXPECT_NE(r.out.find("\n      [NRVTAVO_ControlledBy] NRVTAVO_EthernetPort "), std::string::npos) << r.out;
+  // A bounded walk stops below the cards.
+  auto shallow = runClient({"tree", chassis, "depth=1"});
+  ASSERT_EQ(shallow.status, 0) << shallow.err;
+  EXPECT_EQ(shallow.out.find("NRVTAVO_Chip"), std::string::npos) << shallow.out;
+}
+
+}  // namespace

@@ -266,3 +266,31 @@ TEST(CatalogueWithPlatform, TheHostAndChassisComeFromThePlatform) {
 }
 
 }  // namespace
+
+namespace {
+
+// The platform's Base Server profile references every profile of the module
+// but Profile Registration; without it there are no references.
+TEST(CatalogueWithPlatform, TheBaseServerProfileReferencesTheModulesProfiles) {
+  {
+    Host plain(Host::defaultModulePath(), Host::Options{std::nullopt});
+    Result none = plain.enumerateInstances(kNs, "NRVTAVO_BaseServerReferencedProfile");
+    ASSERT_TRUE(none.ok()) << none.errorText();
+    EXPECT_TRUE(none.instances.empty());
+  }
+
+  Host host(Host::defaultModulePath(),
+            Host::Options{std::string(NRV_HOST_TEST_DATA) + "/platform_base_server.json"});
+  Result refs = host.enumerateInstances(kNs, "NRVTAVO_BaseServerReferencedProfile");
+  ASSERT_TRUE(refs.ok()) << refs.errorText();
+  ASSERT_EQ(refs.instances.size(), 16u);
+  const PathData& base = ref(findNamed(refs.instances[0].properties, "Antecedent"));
+  EXPECT_EQ(base.nameSpace, "root/pg_interop");
+  EXPECT_EQ(text(findNamed(base.keys, "InstanceID")), "KVLD:Base Server");
+  const PathData& first = ref(findNamed(refs.instances[0].properties, "Dependent"));
+  EXPECT_EQ(text(findNamed(first.keys, "InstanceID")), "NRV:Ethernet Port");
+  for (const HostInstance& r : refs.instances)
+    EXPECT_NE(text(findNamed(ref(findNamed(r.properties, "Dependent")).keys, "InstanceID")), "NRV:Profile Registration");
+}
+
+}  // namespace

@@ -1,0 +1,42 @@
+// Refresh_Provider<C, Refresh>: the catalogue provider of a class whose
+// volatile values (link state, speeds, temperature, statistics, driver
+// parameters) are refreshed in its map, at most once per interval, just
+// before the map is copied out.  Everything else is Catalogue_Provider<C>'s.
+//
+// Contract: the refresh runs under the agent's locks in the data-fetch
+// thread's order, then under this provider's own recursive mutex, one per
+// class, made on first use and kept for the life of the module.
+#pragma once
+
+#include <mutex>
+
+#include "agent/Status_Refresh.h"
+#include "derivedObjects/Catalogue_Provider.h"
+
+namespace cimple {
+
+template <class C, void (*Refresh)(ProviderAgent&)>
+class Refresh_Provider : public Catalogue_Provider<C> {
+ public:
+  int enum_instances(const Instance*, const Handler& handler) {
+    static std::recursive_mutex own;  // lives until the module is unloaded, after its last request
+    return enumerate_refreshed(C::static_meta_class.name, "Refresh_Provider.h", &agent_map<C>,
+                               Status_Refresh{Refresh, &own}, handler);
+  }
+};
+
+// The classes whose providers refresh, and the refresh each runs.
+#define NRV_REFRESH_PROVIDERS(X)                               \
+  X(NRVTAVO_Card, UpdateBoardTemp)                             \
+  X(NRVTAVO_EthernetPort, UpdateEthernetPortStatus)            \
+  X(NRVTAVO_FCPort, UpdateFCoEPortStatus)                      \
+  X(NRVTAVO_FCPortStatistics, GetFCoEPortStats)                \
+  X(NRVTAVO_PortController, UpdatePhyLinkDownReason)           \
+  X(NRVTAVO_DriverParameterSettingData, UpdateDriverParameters)
+
+#define NRV_DECLARE_REFRESH_PROVIDER(C, R) \
+  class C##_Provider : public Refresh_Provider<C, &R> {};
+NRV_REFRESH_PROVIDERS(NRV_DECLARE_REFRESH_PROVIDER)
+#undef NRV_DECLARE_REFRESH_PROVIDER
+
+}  // namespace cimple
