@@ -11,6 +11,11 @@ Output, in --out (the build's generated/schema folder):
   MetaTables_<n>.cpp  the Meta_* records, split into a few translation units
   Repository.cpp      the repository array
 
+With --share, also the CIMOM's view of the same provider classes
+(registration.py): <location>.reg, the SFCB provider registration, the
+module's MOF per namespace (mof/) and repository.json, the class repository
+of the CIMOM stand-in.
+
 The class resolution and the layout rule live in meta_model.py; this file
 only writes C++.
 
@@ -23,6 +28,7 @@ import sys
 
 sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
 import mof  # noqa: E402
+import registration  # noqa: E402
 from meta_model import Schema, SchemaError  # noqa: E402
 
 NUM_CHUNKS = 8
@@ -279,8 +285,13 @@ def emit_classes_h(schema):
     return "\n".join(out) + "\n"
 
 
+def provider_classes(schema, prefix):
+    """The classes the module serves, in schema order."""
+    return [rc for rc in schema.order if rc.name.startswith(prefix)]
+
+
 def emit_provider_classes(schema, prefix):
-    provided = [rc for rc in schema.order if rc.name.startswith(prefix)]
+    provided = provider_classes(schema, prefix)
 
     def xlist(macro, items):
         lines = ["#define %s(X) \\" % macro]
@@ -312,7 +323,7 @@ def write(path, text):
         f.write(text)
 
 
-def generate(mof_files, out_dir, prefix="NRVTAVO_"):
+def generate(mof_files, out_dir, prefix="NRVTAVO_", share_dir=None, location=None):
     """Headers are rewritten only when they change, so a schema edit rebuilds
     only what it affects; the .cpp files are the build's declared outputs and
     are always rewritten, so they are newer than every input."""
@@ -329,16 +340,22 @@ def generate(mof_files, out_dir, prefix="NRVTAVO_"):
         chunk = schema.order[i * per:(i + 1) * per]
         write(os.path.join(out_dir, "MetaTables_%d.cpp" % i), emit_chunk(chunk, schema))
     write(os.path.join(out_dir, "Repository.cpp"), emit_repository_cpp(schema))
+    if share_dir:
+        registration.write_share(share_dir, schema, provider_classes(schema, prefix), location,
+                                 write_if_changed)
     return schema
 
 
 def main():
     ap = argparse.ArgumentParser(description=__doc__.split("\n")[0])
     ap.add_argument("--out", required=True, help="output folder (generated/schema)")
+    ap.add_argument("--share", help="folder for the registration and the class repository")
+    ap.add_argument("--location", default="norvane_tavo_provider",
+                    help="the module's library name without lib and .so")
     ap.add_argument("mof", nargs="*", help="MOF files")
     args = ap.parse_args()
     try:
-        generate(args.mof, args.out)
+        generate(args.mof, args.out, share_dir=args.share, location=args.location)
     except (SchemaError, mof.MofError) as e:
         sys.exit("gen_meta: %s" % e)
 
