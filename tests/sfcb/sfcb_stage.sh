@@ -113,8 +113,8 @@ if readelf -d "$module" | grep -q 'NEEDED.*libasan'; then
 fi
 # Each system root starts as a fresh system: an /etc for the configuration files.
 mkdir -p "$work/root-sfcb/etc" "$work/root-host/etc"
-start_sfcbd() {
-  timeout 90 "$S/sfcb-start.sh" --timeout 60 --append-logs "$P" 0 "${simenv[@]}" \
+start_sfcbd() {  # start_sfcbd [--append-logs]: the first start empties the logs, a restart keeps them
+  timeout 90 "$S/sfcb-start.sh" --timeout 60 "$@" "$P" 0 "${simenv[@]}" \
       "${sfcbenv[@]}" NRV_SYSROOT="$work/root-sfcb" > "$work/start.log" 2>&1 || { cat "$work/start.log"; exit 1; }
   running=1
   url=http://localhost:$(cat "$P/var/run/sfcb/sfcbd.port")
@@ -170,7 +170,7 @@ done
 
 # 6. the setting survives a restart of sfcbd (nrv-cim: the next process)
 stop_sfcbd
-start_sfcbd
+start_sfcbd --append-logs
 ask gi-after-restart gi "$timeout_setting"
 
 # 7. the comparison, and the stage's own checks.
