@@ -23,9 +23,8 @@ if [ ! -d "$S" ]; then
 fi
 S=$(cd "$S" && pwd)
 SCHEMA=$(cd "$shared/cim-schema" && pwd)
-cache=${XDG_CACHE_HOME:-$HOME/.cache}/norvane_tavo_provider
-P=${NRV_SFCB_PREFIX:-$cache/sfcb-1.4.10}
-mkdir -p "$cache" "$(dirname "$P")"
+P=${NRV_SFCB_PREFIX:-${XDG_CACHE_HOME:-$HOME/.cache}/norvane_tavo_provider/sfcb-1.4.10}
+mkdir -p "$(dirname "$P")"
 T0=$SECONDS
 
 # One stage at a time per prefix: SFCB allows one sfcbd per prefix, and registering rewrites it.
@@ -67,8 +66,7 @@ say "SFCB in $P ready after $((SECONDS - t))s"
 command -v wbemcli > /dev/null || { say "wbemcli is missing (Debian package sblim-wbemcli)"; exit 1; }
 
 # 2. the module, installed as an administrator installs it; and checked that DESTDIR works
-inst=$cache/install
-rm -rf "$inst" "$work/destdir"
+inst=$work/install
 cmake --install "$build" --prefix "$inst" > "$work/install.log"
 DESTDIR=$work/destdir cmake --install "$build" --prefix /usr > /dev/null
 [ -f "$work/destdir/usr/lib/cmpi/libnorvane_tavo_provider.so" ] ||
