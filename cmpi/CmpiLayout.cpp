@@ -172,7 +172,10 @@ NRV_SLOT(CMPIBrokerExtFT, resolveFileName, 1);
 NRV_SLOT(CMPIBrokerExtFT, newThread, 2);
 NRV_SLOT(CMPIBrokerExtFT, signalCondition, 20);
 NRV_SLOT(CMPIBrokerMemFT, mark, 1);
-NRV_SLOT(CMPIBrokerMemFT, freeSelectExp, 9);
+NRV_SLOT(CMPIBrokerMemFT, cmpiMalloc, 3);
+NRV_SLOT(CMPIBrokerMemFT, cmpiFree, 7);
+NRV_SLOT(CMPIBrokerMemFT, freeInstance, 8);
+NRV_SLOT(CMPIBrokerMemFT, freeSelectExp, 14);
 
 // MI tables: ftVersion and miVersion share the first slot, miName, cleanup, operations.
 #define NRV_MI_HEAD(T) \

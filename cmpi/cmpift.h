@@ -3,6 +3,8 @@
 #ifndef _CMPIFT_H_
 #define _CMPIFT_H_
 
+#include <stddef.h>
+
 #include "cmpidt.h"
 
 #ifdef __cplusplus
@@ -151,6 +153,12 @@ struct _CMPIBrokerMemFT {
 
     CMPIGcStat* (*mark)(const CMPIBroker* mb, CMPIStatus* rc);
     CMPIStatus (*release)(const CMPIBroker* mb, const CMPIGcStat* gc);
+    /* Memory the broker owns: freed with cmpiFree, or by the broker when the request ends. */
+    void* (*cmpiMalloc)(const CMPIBroker* mb, size_t size);
+    void* (*cmpiCalloc)(const CMPIBroker* mb, size_t count, size_t size);
+    void* (*cmpiRealloc)(const CMPIBroker* mb, void* ptr, size_t size);
+    char* (*cmpiStrDup)(const CMPIBroker* mb, const char* str);
+    void (*cmpiFree)(const CMPIBroker* mb, void* ptr);
     void (*freeInstance)(const CMPIBroker* mb, CMPIInstance* inst);
     void (*freeObjectPath)(const CMPIBroker* mb, CMPIObjectPath* obj);
     void (*freeArgs)(const CMPIBroker* mb, CMPIArgs* args);

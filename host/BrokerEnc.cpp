@@ -1,8 +1,11 @@
 // BrokerEnc: the broker's encapsulated-object services (CMPIBrokerEncFT) and memory services
 // (CMPIBrokerMemFT).
+#include <algorithm>
 #include <cstdarg>
+#include <cstdint>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 
 #include "host/Broker.h"
 #include "host/EncObjects.h"
@@ -307,6 +310,42 @@ CMPIStatus release(const CMPIBroker* mb, const CMPIGcStat* gc) {
   return makeStatus(CMPI_RC_OK);
 }
 
+// Zero-filled, like calloc, so no request sees another's leftovers.
+void* allocate(const CMPIBroker* mb, size_t size) {
+  if (!Broker::isLive(mb)) return nullptr;
+  return registry().adopt(std::make_unique<EncMemory>(mb, size))->data();
+}
+
+void* cmpiMalloc(const CMPIBroker* mb, size_t size) { return allocate(mb, size); }
+
+void* cmpiCalloc(const CMPIBroker* mb, size_t count, size_t size) {
+  if (size != 0 && count > SIZE_MAX / size) return nullptr;
+  return allocate(mb, count * size);
+}
+
+void cmpiFree(const CMPIBroker* mb, void* ptr) {
+  if (Broker::isLive(mb) && registry().find<EncMemory>(ptr) != nullptr) registry().release(ptr);
+}
+
+void* cmpiRealloc(const CMPIBroker* mb, void* ptr, size_t size) {
+  if (ptr == nullptr) return allocate(mb, size);
+  EncMemory* old = Broker::isLive(mb) ? registry().find<EncMemory>(ptr) : nullptr;
+  if (old == nullptr) return nullptr;
+  void* grown = allocate(mb, size);
+  if (grown == nullptr) return nullptr;
+  std::memcpy(grown, old->data(), std::min(size, old->size()));
+  registry().release(ptr);
+  return grown;
+}
+
+char* cmpiStrDup(const CMPIBroker* mb, const char* str) {
+  if (str == nullptr) return nullptr;
+  const size_t n = std::strlen(str) + 1;
+  auto* copy = static_cast<char*>(allocate(mb, n));
+  if (copy != nullptr) std::memcpy(copy, str, n);
+  return copy;
+}
+
 template <typename T, typename H>
 void freeObject(const CMPIBroker* mb, H* handle) {
   if (Broker::isLive(mb) && registry().find<T>(handle) != nullptr) {
@@ -333,8 +372,9 @@ const CMPIBrokerEncFT kBrokerEncFT = {
 };
 
 const CMPIBrokerMemFT kBrokerMemFT = {
-    CMPIVersion200, mark,      release,      freeInstance, freeObjectPath,
-    freeArgs,       freeString, freeArray,   freeDateTime, freeSelectExp,
+    CMPIVersion200, mark,          release,        cmpiMalloc, cmpiCalloc,
+    cmpiRealloc,    cmpiStrDup,    cmpiFree,       freeInstance, freeObjectPath,
+    freeArgs,       freeString,    freeArray,      freeDateTime, freeSelectExp,
 };
 
 }  // namespace nrv::host

@@ -337,9 +337,11 @@ int runCimClient(const std::vector<std::string>& args, std::ostream& out, std::o
   const Command& c = std::get<Command>(parsed);
   auto op = operations().find(c.op);
   if (op == operations().end()) return usage("unknown operation " + c.op, err);
-  auto path = parsePath(c.pathText);
-  if (auto* e = std::get_if<TextError>(&path)) return usage(e->message, err);
   auto host = std::make_unique<Host>(modulePath(c));
+  if (!host->catalogError().empty()) err << "nrv-cim: warning: " << host->catalogError() << "\n";
+  // Keys are read against the module's classes, as a CIMOM reads them.
+  auto path = parsePath(c.pathText, kDefaultNameSpace, host->keySchema());
+  if (auto* e = std::get_if<TextError>(&path)) return usage(e->message, err);
   const int status = op->second(*host, c, std::get<PathData>(path), out, err);
   // What was printed stays printed whatever the module does while it unloads.
   out.flush();

@@ -118,6 +118,23 @@ class EncResult : public EncBase<CMPIResult, CMPIResultFT, EncKind::Result> {
   const std::shared_ptr<ResultSink> sink;
 };
 
+// A block of the broker's memory services: its address is the handle, so cmpiFree and
+// cmpiRealloc find it, and the arena frees it when the request ends.
+class EncMemory : public EncObject {
+ public:
+  static constexpr EncKind kKind = EncKind::Memory;
+  EncMemory(const void* owner, size_t size)
+      : EncObject(owner), size_(size), bytes_(std::make_unique<char[]>(size == 0 ? 1 : size)) {}
+  EncKind kind() const override { return kKind; }
+  const void* handle() const override { return bytes_.get(); }
+  char* data() { return bytes_.get(); }
+  size_t size() const { return size_; }
+
+ private:
+  const size_t size_;
+  const std::unique_ptr<char[]> bytes_;
+};
+
 // Constructors; see the contract above.
 CMPIString* makeString(const void* owner, std::string text, bool detached = false);
 CMPIDateTime* makeDateTime(const void* owner, DateTimeValue value, bool detached = false);

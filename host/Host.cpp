@@ -2,6 +2,7 @@
 #include "host/Host.h"
 
 #include <cstdlib>
+#include <filesystem>
 
 #include "host/MiInvoker.h"
 
@@ -26,6 +27,34 @@ Result toResult(Outcome outcome) {
   r.returnValue = std::move(outcome.returnValue);
   r.outArgs = std::move(outcome.outArgs);
   return r;
+}
+
+// An explicitly named file, else the default beside the module if it exists; nullopt: none.
+std::optional<std::string> chosenFile(const std::optional<std::string>& option,
+                                      const std::optional<std::string>& shareDir,
+                                      const std::string& name) {
+  if (option) return option->empty() ? std::nullopt : option;
+  if (!shareDir || !std::filesystem::exists(*shareDir + "/" + name)) return std::nullopt;
+  return *shareDir + "/" + name;
+}
+
+// Reads an optional file with T::read; a failure goes to `error` and leaves none.
+template <typename T>
+std::unique_ptr<T> readOptional(const std::optional<std::string>& path, std::string& error) {
+  if (!path) return nullptr;
+  auto read = T::read(*path);
+  if (auto* e = std::get_if<std::string>(&read)) {
+    error += (error.empty() ? "" : "; ") + *e;
+    return nullptr;
+  }
+  return std::make_unique<T>(std::get<T>(std::move(read)));
+}
+
+std::string moduleName(const std::string& modulePath) {
+  std::string name = std::filesystem::path(modulePath).filename().string();
+  if (name.rfind("lib", 0) == 0) name.erase(0, 3);
+  if (const size_t so = name.find(".so"); so != std::string::npos) name.resize(so);
+  return name;
 }
 
 Request requestFor(Operation op, const PathData& path) {
@@ -55,16 +84,38 @@ std::string Host::defaultModulePath() {
 
 Host::Host(const std::string& modulePath) : Host(modulePath, Options{}) {}
 
+std::optional<std::string> Host::shareDirFor(const std::string& modulePath) {
+  const std::filesystem::path dir = std::filesystem::path(modulePath).parent_path();
+  const std::string name = moduleName(modulePath);
+  for (const auto& candidate : {dir / ".." / "share" / name, dir / ".." / ".." / "share" / name}) {
+    std::error_code ec;
+    if (std::filesystem::is_directory(candidate, ec)) return candidate.lexically_normal().string();
+  }
+  return std::nullopt;
+}
+
 Host::Host(const std::string& modulePath, Options options)
-    : broker_(std::make_unique<Broker>(*this)), platform_(options.platformFile) {
+    : broker_(std::make_unique<Broker>(*this)),
+      platform_(options.platformFile),
+      cleanup_(options.cleanup) {
   auto opened = ModuleLoader::open(modulePath);
   if (auto* loader = std::get_if<std::unique_ptr<ModuleLoader>>(&opened)) {
     module_ = std::move(*loader);
     table_ = std::make_unique<ProviderTable>(*module_, broker_->cmpi());
   } else {
     loadError_ = std::get<std::string>(opened);
+    return;
   }
+  const auto share = shareDirFor(modulePath);
+  const std::string name = moduleName(modulePath);
+  registration_ = readOptional<Registration>(
+      chosenFile(options.registrationFile, share, name + ".reg"), catalogError_);
+  repository_ = readOptional<ClassRepository>(
+      chosenFile(options.repositoryFile, share, "repository.json"), catalogError_);
+  dispatch_ = std::make_unique<Dispatch>(*module_, registration_.get(), repository_.get());
 }
+
+KeySchema Host::keySchema() const { return repository_ ? repository_->keySchema() : KeySchema{}; }
 
 Host::~Host() {
   shutdown();
@@ -72,6 +123,7 @@ Host::~Host() {
   // module under it would crash the process, so it stays mapped.
   if (module_ && broker_->attachedThreads() > 0) module_->pin();
   // The module goes before the broker: its static destructors may still release objects.
+  dispatch_.reset();
   table_.reset();
   module_.reset();
   broker_.reset();
@@ -96,7 +148,10 @@ void Host::shutdown() {
     shut_ = true;
     gateCv_.wait(lock, [this] { return inFlight_ == 0; });
   }
-  if (table_) cleanups_ = table_->cleanupAll(Broker::requestContext(kDefaultNameSpace));
+  if (table_) {
+    cleanups_ = table_->cleanupAll(Broker::requestContext(kDefaultNameSpace),
+                                   cleanup_ == Cleanup::OncePerMiType);
+  }
 }
 
 Outcome Host::route(const Request& incoming) {
@@ -111,7 +166,7 @@ Outcome Host::route(const Request& incoming) {
   } else if (!module_) {
     out = Outcome::failure(CMPI_RC_ERR_FAILED, "provider module not loaded: " + loadError_);
   } else {
-    out = invokeMi(*table_, *module_, broker_->cmpi(), request);
+    out = invokeMi(*table_, *dispatch_, broker_->cmpi(), request);
   }
   leave();
   return out;

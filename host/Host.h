@@ -22,8 +22,16 @@
 //   mapped unless NRV_HOST_UNLOAD_MODULE is set, and always while a thread it attached has not
 //   detached) and frees the broker's objects; later broker calls from module threads are
 //   refused, not crashed on. A module loaded again by a later Host keeps its global state.
+//   With Cleanup::OncePerMiType, shutdown cleans up as SFCB does: only the first MI of each
+//   kind (instance, association, method, indication) is cleaned up; the others are dropped.
 // - A module that cannot be loaded is not fatal: loadError() says why, module classes answer
 //   CMPI_RC_ERR_FAILED, the platform classes still work.
+// - Like a CIMOM, the host routes by the module's registration and class repository, found
+//   beside the module (share/<name>/<name>.reg and repository.json, see shareDirFor()) unless
+//   Options say otherwise: a class asked for in a namespace it is not declared in is
+//   CMPI_RC_ERR_INVALID_CLASS, an unknown namespace CMPI_RC_ERR_INVALID_NAMESPACE, and an
+//   enumeration of a superclass reaches the providers of its subclasses (see Dispatch.h).
+//   Without them every class is served in every namespace by the provider named like it.
 // - Platform instances come from the JSON file named by NRV_HOST_PLATFORM (see
 //   PlatformProvider.h) unless Options::platformFile says otherwise.
 #ifndef NRV_HOST_HOST_H
@@ -38,11 +46,14 @@
 
 #include "cmpift.h"
 #include "host/Broker.h"
+#include "host/ClassRepository.h"
 #include "host/Datum.h"
+#include "host/Dispatch.h"
 #include "host/ModuleLoader.h"
 #include "host/PathText.h"
 #include "host/PlatformProvider.h"
 #include "host/ProviderTable.h"
+#include "host/Registration.h"
 #include "host/Request.h"
 
 namespace nrv::host {
@@ -80,8 +91,14 @@ struct ClassMis {
 
 class Host : public Router {
  public:
+  enum class Cleanup { EveryMi, OncePerMiType };
   struct Options {
     std::optional<std::string> platformFile = PlatformProvider::pathFromEnvironment();
+    // The module's registration and class repository; unset: beside the module when there
+    // (shareDirFor), an empty string: none.
+    std::optional<std::string> registrationFile;
+    std::optional<std::string> repositoryFile;
+    Cleanup cleanup = Cleanup::EveryMi;
   };
 
   explicit Host(const std::string& modulePath = defaultModulePath());
@@ -92,9 +109,19 @@ class Host : public Router {
 
   // $NRV_MODULE, else "build/lib/libnorvane_tavo_provider.so".
   static std::string defaultModulePath();
+  // Where the build or the install put what a CIMOM reads beside DIR/lib<name>.so:
+  // DIR/../share/<name> (build tree) or DIR/../../share/<name> (installed under lib/cmpi),
+  // whichever exists; nullopt when neither does.
+  static std::optional<std::string> shareDirFor(const std::string& modulePath);
 
   bool moduleLoaded() const { return module_ != nullptr; }
   const std::string& loadError() const { return loadError_; }
+  // Why the registration or the repository could not be read (empty when they could, or
+  // when there were none).
+  const std::string& catalogError() const { return catalogError_; }
+  const Registration* registration() const { return registration_.get(); }
+  // The key schema of the module's classes, for parsePath (empty without a repository).
+  KeySchema keySchema() const;
 
   Result enumerateInstances(const std::string& ns, const std::string& className,
                             PropertyList properties = std::nullopt);
@@ -139,7 +166,12 @@ class Host : public Router {
   std::unique_ptr<Broker> broker_;
   std::unique_ptr<ModuleLoader> module_;
   std::unique_ptr<ProviderTable> table_;
+  std::unique_ptr<Registration> registration_;
+  std::unique_ptr<ClassRepository> repository_;
+  std::unique_ptr<Dispatch> dispatch_;
   std::string loadError_;
+  std::string catalogError_;
+  Cleanup cleanup_;
   PlatformProvider platform_;
 
   std::mutex gateMu_;

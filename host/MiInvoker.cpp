@@ -143,37 +143,50 @@ Outcome associationFor(ProviderTable& table, const CMPIBroker* mb, const Request
                            assocClass);
 }
 
-}  // namespace
-
-Outcome invokeMi(ProviderTable& table, const ModuleLoader& module, const CMPIBroker* broker,
-                 const Request& request) {
-  ArenaScope scope;
+// A non-association request to the provider of its path's class.
+Outcome callFor(ProviderTable& table, const CMPIBroker* broker, const Request& request) {
   if (request.op == Operation::InvokeMethod) {
     auto mi = table.mi(request.path.className, MiKind::Method, request.context);
     if (auto* failure = std::get_if<Outcome>(&mi)) return std::move(*failure);
     return callMethodMi(static_cast<CMPIMethodMI*>(std::get<void*>(mi)), broker, request);
   }
-  if (!isAssociationOperation(request.op)) {
-    auto mi = table.mi(request.path.className, MiKind::Instance, request.context);
-    if (auto* failure = std::get_if<Outcome>(&mi)) return std::move(*failure);
-    return callInstanceMi(static_cast<CMPIInstanceMI*>(std::get<void*>(mi)), broker, request);
-  }
-  if (request.assocClass && !request.assocClass->empty()) {
-    return associationFor(table, broker, request, *request.assocClass);
-  }
-  // Without an association class every association provider is asked; a provider that fails
-  // does not hide the others' answers, but if all fail the first failure is the answer.
+  auto mi = table.mi(request.path.className, MiKind::Instance, request.context);
+  if (auto* failure = std::get_if<Outcome>(&mi)) return std::move(*failure);
+  return callInstanceMi(static_cast<CMPIInstanceMI*>(std::get<void*>(mi)), broker, request);
+}
+
+}  // namespace
+
+Outcome invokeMi(ProviderTable& table, const Dispatch& dispatch, const CMPIBroker* broker,
+                 const Request& request) {
+  ArenaScope scope;
+  auto targets = dispatch.targets(request);
+  if (auto* failure = std::get_if<Outcome>(&targets)) return std::move(*failure);
+  const bool association = isAssociationOperation(request.op);
+  const bool tolerant = association && !dispatch.registered();
   Outcome merged;
   std::optional<Outcome> firstFailure;
   bool anySuccess = false;
-  for (const auto& cls : module.classesWith(MiKind::Association)) {
-    Outcome o = associationFor(table, broker, request, cls);
+  for (const auto& cls : std::get<std::vector<std::string>>(targets)) {
+    Outcome o;
+    if (association) {
+      o = associationFor(table, broker, request, cls);
+    } else {
+      Request own = request;
+      own.path.className = cls;
+      o = callFor(table, broker, own);
+    }
     if (!o.ok()) {
+      if (!tolerant) return o;
       if (!firstFailure) firstFailure = std::move(o);
       continue;
     }
     anySuccess = true;
-    for (auto& item : o.items) merged.items.push_back(std::move(item));
+    if (merged.items.empty()) {
+      merged = std::move(o);
+    } else {
+      for (auto& item : o.items) merged.items.push_back(std::move(item));
+    }
   }
   if (!anySuccess && firstFailure) return std::move(*firstFailure);
   return merged;

@@ -8,15 +8,16 @@
 #define NRV_HOST_MIINVOKER_H
 
 #include "cmpift.h"
-#include "host/ModuleLoader.h"
+#include "host/Dispatch.h"
 #include "host/ProviderTable.h"
 #include "host/Request.h"
 
 namespace nrv::host {
 
-// Association requests without an association class go to every association provider of the
-// module, each called with its own class as the association class.
-Outcome invokeMi(ProviderTable& table, const ModuleLoader& module, const CMPIBroker* broker,
+// The request goes to the providers Dispatch names: an enumeration to each with the path's
+// class replaced by the provider's class, an association request to each association
+// provider with its own class as the association class; their answers are merged.
+Outcome invokeMi(ProviderTable& table, const Dispatch& dispatch, const CMPIBroker* broker,
                  const Request& request);
 
 }  // namespace nrv::host

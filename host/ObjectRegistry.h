@@ -18,7 +18,7 @@
 namespace nrv::host {
 
 enum class EncKind { String, Array, DateTime, ObjectPath, Instance, Args, Context, Enumeration,
-                     Result, SelectExp, Error };
+                     Result, SelectExp, Error, Memory };
 
 class Arena;
 

@@ -7,6 +7,8 @@
 #include <charconv>
 #include <cstdlib>
 #include <limits>
+#include <unordered_map>
+#include <unordered_set>
 
 namespace nrv::host {
 
@@ -144,7 +146,8 @@ constexpr IntRange kIntRanges[] = {
      std::numeric_limits<long long>::max()},
 };
 
-std::variant<Datum, TextError> typedScalar(std::string_view text, CMPIType type) {
+std::variant<Datum, TextError> typedScalar(std::string_view text, CMPIType type,
+                                           const KeySchema& schema = {}) {
   for (const auto& r : kIntRanges) {
     if (r.type != type) continue;
     if (r.isSigned) {
@@ -183,7 +186,7 @@ std::variant<Datum, TextError> typedScalar(std::string_view text, CMPIType type)
       return Datum::time(*dt);
     }
     case CMPI_ref: {
-      auto path = parsePath(*raw);
+      auto path = parsePath(*raw, kDefaultNameSpace, schema);
       if (auto* e = std::get_if<TextError>(&path)) return *e;
       return Datum::reference(std::get<PathData>(std::move(path)));
     }
@@ -192,31 +195,61 @@ std::variant<Datum, TextError> typedScalar(std::string_view text, CMPIType type)
   }
 }
 
-// A quoted key value naming a full object path with keys is a reference.
-Datum quotedKeyValue(std::string text) {
-  if (text.find('.') != std::string::npos && text.find('=') != std::string::npos) {
-    auto path = parsePath(text);
-    if (auto* p = std::get_if<PathData>(&path); p != nullptr && !p->keys.empty()) {
-      return Datum::reference(std::move(*p));
-    }
-  }
-  return Datum::string(std::move(text));
+std::string lower(std::string_view s) {
+  std::string out(s);
+  for (char& c : out) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+  return out;
 }
 
-std::variant<Datum, TextError> keyValue(std::string_view text) {
-  if (text.empty()) return fail("missing key value");
+// The type of a typed key value `(type)value`, and the value text after it.
+std::variant<std::pair<std::optional<CMPIType>, std::string_view>, TextError> typePrefix(
+    std::string_view text) {
+  if (text.empty() || text.front() != '(') return std::pair{std::optional<CMPIType>{}, text};
+  const size_t close = text.find(')');
+  if (close == std::string_view::npos) return TextError{"unterminated type in key value"};
+  const std::string name(trim(text.substr(1, close - 1)));
+  auto type = name == "reference" ? std::optional<CMPIType>(CMPI_ref) : typeFromName(name);
+  if (!type || (*type & CMPI_ARRAY) != 0) return TextError{"bad key type: " + name};
+  return std::pair{type, trim(text.substr(close + 1))};
+}
+
+// An untyped key value read by its literal form alone.
+std::variant<Datum, TextError> literalKeyValue(std::string_view text) {
   if (text.front() == '"') {
     size_t pos = 0;
     auto s = readQuoted(text, pos);
     if (!s) return fail("unterminated string in key value");
     if (pos != text.size()) return fail("text after quoted key value: " + std::string(text));
-    return quotedKeyValue(std::move(*s));
+    return Datum::string(std::move(*s));
   }
   if (strcasecmp(std::string(text).c_str(), "true") == 0) return Datum::boolean(true);
   if (strcasecmp(std::string(text).c_str(), "false") == 0) return Datum::boolean(false);
   if (auto i = integerLiteral(text)) return *i;
   if (auto r = realLiteral(text)) return *r;
   return fail("bad key value: " + std::string(text));
+}
+
+// A key value: of the declared type when the class is known, else of its typed form or its
+// literal form.
+std::variant<Datum, TextError> keyValue(std::string_view text, const KeyDecl* declared,
+                                        const KeySchema& schema) {
+  if (text.empty()) return fail("missing key value");
+  auto prefixed = typePrefix(text);
+  if (auto* e = std::get_if<TextError>(&prefixed)) return *e;
+  auto [typed, body] = std::get<0>(prefixed);
+  if (body.empty()) return fail("missing key value");
+  if (declared != nullptr) {
+    if (typed && *typed != declared->type) {
+      return fail("key " + declared->name + " is of type " + typeName(declared->type));
+    }
+    auto value = typedScalar(body, declared->type, schema);
+    if (auto* e = std::get_if<TextError>(&value)) {
+      return fail("key " + declared->name + ": " + e->message);
+    }
+    return value;
+  }
+  if (typed) return typedScalar(body, *typed, schema);
+  return literalKeyValue(body);
 }
 
 std::string formatReal(double v) {
@@ -228,7 +261,8 @@ std::string formatReal(double v) {
 }  // namespace
 
 std::variant<PathData, TextError> parsePath(std::string_view input,
-                                            const std::string& defaultNameSpace) {
+                                            const std::string& defaultNameSpace,
+                                            const KeySchema& schema) {
   std::string_view text = trim(input);
   if (text.empty()) return TextError{"empty object path"};
   PathData path;
@@ -250,15 +284,31 @@ std::variant<PathData, TextError> parsePath(std::string_view input,
   if (bindings.empty()) return TextError{"missing key bindings after '.'"};
   auto parts = splitList(bindings);
   if (!parts) return TextError{"unterminated string in key bindings"};
+  // The class's declared keys by lower-case name, when the schema knows the class.
+  std::optional<std::unordered_map<std::string, KeyDecl>> declared;
+  if (schema) {
+    if (auto keys = schema(path.className)) {
+      declared.emplace();
+      for (auto& k : *keys) declared->emplace(lower(k.name), std::move(k));
+    }
+  }
+  std::unordered_set<std::string> seen;
   for (std::string_view part : *parts) {
     const size_t eq = part.find('=');
     if (eq == std::string_view::npos) return TextError{"missing '=' in key binding: " + std::string(part)};
     const std::string_view name = trim(part.substr(0, eq));
     if (!isIdentifier(name)) return TextError{"bad key name: " + std::string(name)};
-    if (findNamed(path.keys, std::string(name)) != nullptr) {
-      return TextError{"duplicate key: " + std::string(name)};
+    const std::string low = lower(name);
+    if (!seen.insert(low).second) return TextError{"duplicate key: " + std::string(name)};
+    const KeyDecl* decl = nullptr;
+    if (declared) {
+      auto it = declared->find(low);
+      if (it == declared->end()) {
+        return TextError{"class " + path.className + " has no key " + std::string(name)};
+      }
+      decl = &it->second;
     }
-    auto value = keyValue(trim(part.substr(eq + 1)));
+    auto value = keyValue(trim(part.substr(eq + 1)), decl, schema);
     if (auto* e = std::get_if<TextError>(&value)) return *e;
     path.keys.emplace_back(std::string(name), std::get<Datum>(std::move(value)));
   }

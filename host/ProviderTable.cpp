@@ -3,6 +3,7 @@
 
 #include <strings.h>
 
+#include <algorithm>
 #include <optional>
 
 #include "host/EncObjects.h"
@@ -91,17 +92,27 @@ std::vector<LoadedMi> ProviderTable::loaded() const {
   return mis_;
 }
 
-std::vector<CleanupRecord> ProviderTable::cleanupAll(const NamedData& context) {
+std::vector<CleanupRecord> ProviderTable::cleanupAll(const NamedData& context,
+                                                     bool oncePerMiType) {
   std::vector<LoadedMi> mis;
   {
     std::lock_guard<std::recursive_mutex> lock(mu_);
     mis.swap(mis_);
   }
+  std::vector<const LoadedMi*> order;
+  if (oncePerMiType) {
+    for (MiKind kind : {MiKind::Instance, MiKind::Association, MiKind::Method, MiKind::Indication}) {
+      auto first = std::find_if(mis.begin(), mis.end(), [&](const LoadedMi& m) { return m.kind == kind; });
+      if (first != mis.end()) order.push_back(&*first);
+    }
+  } else {
+    for (auto it = mis.rbegin(); it != mis.rend(); ++it) order.push_back(&*it);
+  }
   std::vector<CleanupRecord> records;
-  for (auto it = mis.rbegin(); it != mis.rend(); ++it) {
+  for (const LoadedMi* m : order) {
     ArenaScope scope;
     CMPIContext* ctx = makeContext(broker_, context);
-    records.push_back({it->factory, callCleanup(*it, ctx).value_or(CMPI_RC_ERR_NOT_SUPPORTED)});
+    records.push_back({m->factory, callCleanup(*m, ctx).value_or(CMPI_RC_ERR_NOT_SUPPORTED)});
   }
   return records;
 }

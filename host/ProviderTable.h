@@ -42,8 +42,10 @@ class ProviderTable {
 
   std::vector<LoadedMi> loaded() const;
 
-  // Calls every MI's cleanup with terminating=true, newest first, and forgets them.
-  std::vector<CleanupRecord> cleanupAll(const NamedData& context);
+  // Calls every MI's cleanup with terminating=true, newest first, and forgets them. With
+  // `oncePerMiType`, as SFCB does for a provider library: only the first MI loaded of each
+  // kind, instance, association, method then indication.
+  std::vector<CleanupRecord> cleanupAll(const NamedData& context, bool oncePerMiType = false);
 
  private:
   const ModuleLoader& module_;

@@ -13,6 +13,11 @@ Output, in --out (the build's generated/schema folder):
   MetaTables_<n>.cpp  the Meta_* records, split into a few translation units
   Repository.cpp      the repository array
 
+With --share, also the CIMOM's view of the same provider classes
+(registration.py): <location>.reg, the SFCB provider registration, the
+module's MOF per namespace (mof/) and repository.json, the class repository
+of the CIMOM stand-in.
+
 The class resolution and the layout rule live in meta_model.py, the reading
 and checking of the provider lists in provider_lists.py; this file only
 writes C++.
@@ -26,6 +31,7 @@ import sys
 
 sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
 import mof  # noqa: E402
+import registration  # noqa: E402
 from meta_model import Schema, SchemaError  # noqa: E402
 from provider_lists import ListsError, ProviderLists  # noqa: E402
 
@@ -291,6 +297,11 @@ def xlist(macro, names):
     return lines
 
 
+def provider_classes(schema, prefix):
+    """The classes the module serves, in schema order."""
+    return [rc for rc in schema.order if rc.name.startswith(prefix)]
+
+
 # The provider lists as macros: (macro, what its classes are, the classes).
 SERVED_MACROS = [
     ("NRV_FOR_EACH_ADAPTER_CATALOGUE_CLASS", "Catalogue-backed classes read from the adapter catalogue.",
@@ -350,7 +361,7 @@ def write(path, text):
         f.write(text)
 
 
-def generate(mof_files, out_dir, prefix="NRVTAVO_", lists_file=None):
+def generate(mof_files, out_dir, prefix="NRVTAVO_", lists_file=None, share_dir=None, location=None):
     """Headers are rewritten only when they change, so a schema edit rebuilds
     only what it affects; the .cpp files are the build's declared outputs and
     are always rewritten, so they are newer than every input."""
@@ -370,6 +381,9 @@ def generate(mof_files, out_dir, prefix="NRVTAVO_", lists_file=None):
         chunk = schema.order[i * per:(i + 1) * per]
         write(os.path.join(out_dir, "MetaTables_%d.cpp" % i), emit_chunk(chunk, schema))
     write(os.path.join(out_dir, "Repository.cpp"), emit_repository_cpp(schema))
+    if share_dir:
+        registration.write_share(share_dir, schema, provider_classes(schema, prefix), location,
+                                 write_if_changed)
     return schema
 
 
@@ -377,10 +391,13 @@ def main():
     ap = argparse.ArgumentParser(description=__doc__.split("\n")[0])
     ap.add_argument("--out", required=True, help="output folder (generated/schema)")
     ap.add_argument("--lists", help="provider lists and map groups (schema/provider_lists.txt)")
+    ap.add_argument("--share", help="folder for the registration and the class repository")
+    ap.add_argument("--location", default="norvane_tavo_provider",
+                    help="the module's library name without lib and .so")
     ap.add_argument("mof", nargs="*", help="MOF files")
     args = ap.parse_args()
     try:
-        generate(args.mof, args.out, lists_file=args.lists)
+        generate(args.mof, args.out, lists_file=args.lists, share_dir=args.share, location=args.location)
     except (SchemaError, ListsError, mof.MofError) as e:
         sys.exit("gen_meta: %s" % e)
 

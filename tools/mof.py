@@ -3,7 +3,8 @@
 It understands what the DMTF CIM schema and the module's own MOF files use:
 pragmas (include is followed, the rest ignored), qualifier declarations
 (skipped), class declarations with qualifiers, properties, references and
-methods with parameters, arrays and default values.  Descriptions and every
+methods with parameters, arrays and default values; and writes class
+declarations back.  Descriptions and every
 other qualifier value are kept as parsed Python values so callers can choose
 what matters.  Instance declarations are skipped.
 
@@ -14,7 +15,7 @@ import os
 import re
 
 __all__ = ["MofError", "Qualifier", "Feature", "Param", "CimClass", "parse_files",
-           "parse_text", "format_value", "format_qualifiers"]
+           "parse_text", "format_value", "format_qualifiers", "format_class"]
 
 CIM_TYPES = ("boolean", "uint8", "sint8", "uint16", "sint16", "uint32", "sint32",
              "uint64", "sint64", "real32", "real64", "char16", "string", "datetime")
@@ -465,3 +466,56 @@ def format_qualifiers(quals):
         else:
             parts.append("%s ( %s )" % (q.name, format_value(q.value)))
     return "[" + ", ".join(parts) + "]" if parts else ""
+
+
+def _all_qualifiers(quals):
+    return list(quals)
+
+
+def _format_param(p, keep):
+    q = format_qualifiers(keep(p.quals))
+    text = (q + " " if q else "")
+    if p.ref_class:
+        text += "%s REF %s" % (p.ref_class, p.name)
+    else:
+        text += "%s %s" % (p.type, p.name)
+    if p.is_array:
+        text += "[]"
+    return text
+
+
+def format_class(c, keep=_all_qualifiers):
+    """A class declaration as MOF text; `keep` chooses the qualifiers written
+    (all by default) from each qualifier list."""
+    lines = []
+    q = format_qualifiers(keep(c.quals))
+    if q:
+        lines.append(q)
+    head = "class %s" % c.name
+    if c.superclass:
+        head += " : %s" % c.superclass
+    lines.append(head + " {")
+    for f in c.features:
+        q = format_qualifiers(keep(f.quals))
+        if q:
+            lines.append("  " + q)
+        if f.kind == "method":
+            params = [_format_param(p, keep) for p in f.params]
+            if params:
+                lines.append("  %s %s(" % (f.type, f.name))
+                for i, p in enumerate(params):
+                    lines.append("      " + p + ("," if i + 1 < len(params) else ");"))
+            else:
+                lines.append("  %s %s();" % (f.type, f.name))
+            continue
+        if f.kind == "reference":
+            decl = "%s REF %s" % (f.ref_class, f.name)
+        else:
+            decl = "%s %s" % (f.type, f.name)
+        if f.is_array:
+            decl += "[%s]" % (f.array_size or "")
+        if f.default is not None:
+            decl += " = " + format_value(f.default)
+        lines.append("  " + decl + ";")
+    lines.append("};")
+    return "\n".join(lines) + "\n"

@@ -3,6 +3,8 @@
 // and refusal of a foreign broker handle.
 #include <gtest/gtest.h>
 
+#include <cstring>
+#include <string>
 #include <thread>
 
 #include "HostTestSupport.h"
@@ -184,6 +186,28 @@ TEST_F(BrokerServicesTest, MemoryMarkReleasesNewerObjects) {
   EXPECT_EQ(CBMemRelease(mb, gc).rc, CMPI_RC_OK);
   EXPECT_EQ(ObjectRegistry::instance().liveCount(mb), before);
   EXPECT_EQ(CBMemRelease(mb, gc).rc, CMPI_RC_ERR_INVALID_PARAMETER);
+}
+
+TEST_F(BrokerServicesTest, MemoryBlocksBelongToTheRequest) {
+  const size_t before = ObjectRegistry::instance().liveCount(mb);
+  {
+    ArenaScope request;
+    auto* block = static_cast<char*>(mb->mft->cmpiCalloc(mb, 4, 2));
+    ASSERT_NE(block, nullptr);
+    EXPECT_EQ(std::string(block, 8), std::string(8, '\0'));
+    std::memcpy(block, "abcdefg", 8);
+    auto* grown = static_cast<char*>(mb->mft->cmpiRealloc(mb, block, 64));
+    ASSERT_NE(grown, nullptr);
+    EXPECT_STREQ(grown, "abcdefg");
+    char* copy = mb->mft->cmpiStrDup(mb, "text");
+    EXPECT_STREQ(copy, "text");
+    mb->mft->cmpiFree(mb, copy);
+    mb->mft->cmpiFree(mb, copy);  // already gone: ignored
+    EXPECT_EQ(mb->mft->cmpiRealloc(mb, copy, 8), nullptr);
+    EXPECT_EQ(ObjectRegistry::instance().liveCount(mb), before + 1);
+  }
+  // The request ended: its blocks went with it.
+  EXPECT_EQ(ObjectRegistry::instance().liveCount(mb), before);
 }
 
 TEST_F(BrokerServicesTest, OsServicesThreadsAndRecursiveMutex) {

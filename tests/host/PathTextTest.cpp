@@ -7,14 +7,21 @@
 namespace nrv::host {
 namespace {
 
-PathData mustParse(const std::string& text) {
-  auto r = parsePath(text);
+// The keys a small class repository declares: an association of two widgets, a widget.
+std::optional<std::vector<KeyDecl>> testKeys(const std::string& className) {
+  if (className == "Assoc") return std::vector<KeyDecl>{{"Left", CMPI_ref, "W"}, {"Right", CMPI_ref, "W"}};
+  if (className == "W") return std::vector<KeyDecl>{{"Id", CMPI_string, ""}, {"Slot", CMPI_uint16, ""}};
+  return std::nullopt;
+}
+
+PathData mustParse(const std::string& text, const KeySchema& schema = {}) {
+  auto r = parsePath(text, kDefaultNameSpace, schema);
   EXPECT_TRUE(std::holds_alternative<PathData>(r)) << text;
   return std::holds_alternative<PathData>(r) ? std::get<PathData>(r) : PathData{};
 }
 
-std::string refusal(const std::string& text) {
-  auto r = parsePath(text);
+std::string refusal(const std::string& text, const KeySchema& schema = {}) {
+  auto r = parsePath(text, kDefaultNameSpace, schema);
   return std::holds_alternative<TextError>(r) ? std::get<TextError>(r).message : "";
 }
 
@@ -42,19 +49,33 @@ TEST(PathTextTest, RoundTripsThroughPrinting) {
   for (const std::string text :
        {"root/norvane:NRVTAVO_Chip", "root/norvane:NRVTAVO_Chip.InstanceID=\"NRV:1\"",
         "root/a:C.K1=\"a,b\",K2=18446744073709551615,K3=false,K4=1.5",
-        "root/a:Assoc.Left=\"root/a:W.Id=\\\"x\\\"\",Right=\"root/a:G.Tag=\\\"y\\\"\""}) {
-    PathData p = mustParse(text);
+        "root/a:Assoc.Left=\"root/a:W.Id=\\\"x\\\"\",Right=\"root/a:W.Slot=2\""}) {
+    PathData p = mustParse(text, testKeys);
     EXPECT_EQ(formatPath(p), text);
-    EXPECT_EQ(mustParse(formatPath(p)), p);
+    EXPECT_EQ(mustParse(formatPath(p), testKeys), p);
   }
 }
 
-TEST(PathTextTest, QuotedPathKeyIsAReference) {
-  PathData p = mustParse("root/a:Assoc.Left=\"root/a:W.Id=\\\"x\\\"\",Note=\"a.b\"");
+// DSP0207: an untyped quoted value is a reference only where the class declares a reference.
+TEST(PathTextTest, KeysTakeTheTypesTheClassDeclares) {
+  const std::string left = "Left=\"root/a:W.Id=\\\"x\\\"\"";
+  PathData p = mustParse("root/a:Assoc." + left, testKeys);
   ASSERT_EQ(p.keys[0].second.type, CMPI_ref);
   EXPECT_EQ(p.keys[0].second.path->className, "W");
   EXPECT_EQ(p.keys[0].second.path->keys[0].second.text, "x");
-  EXPECT_EQ(p.keys[1].second.type, CMPI_string);
+  EXPECT_EQ(mustParse("root/a:W.Slot=7", testKeys).keys[0].second.type, CMPI_uint16);
+  EXPECT_EQ(mustParse("K.Note=\"a.b=1\"").keys[0].second.type, CMPI_string);
+  EXPECT_EQ(mustParse("root/a:Other." + left).keys[0].second.type, CMPI_string);
+  PathData typed = mustParse("root/a:Other.Left=(reference)\"root/a:W.Id=\\\"x\\\"\",N=(uint8)3");
+  EXPECT_EQ(typed.keys[0].second.type, CMPI_ref);
+  EXPECT_EQ(typed.keys[1].second.type, CMPI_uint8);
+
+  EXPECT_NE(refusal("W.Id=\"x\",Color=\"red\"", testKeys).find("no key Color"), std::string::npos);
+  EXPECT_NE(refusal("W.Slot=70000", testKeys), "");
+  EXPECT_NE(refusal("W.Slot=(string)\"7\"", testKeys), "");
+  EXPECT_NE(refusal("Assoc.Left=\"not a path\"", testKeys), "");
+  EXPECT_NE(refusal("K.A=(banana)1"), "");
+  EXPECT_NE(refusal("K.A=(uint8"), "");
 }
 
 TEST(PathTextTest, MalformedPathsAreRefused) {

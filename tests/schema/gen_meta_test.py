@@ -3,6 +3,7 @@
 Run by ctest (schema_generator_test) with the tools folder on sys.path.
 """
 
+import json
 import os
 import sys
 import tempfile
@@ -222,6 +223,65 @@ class Lists(unittest.TestCase):
                 with self.assertRaises(ListsError) as caught:
                     self.lists(text)
                 self.assertIn(message, str(caught.exception))
+
+
+# A profile in the interop namespace, an element, and the association between them.
+INTEROP = """
+class CIM_ManagedElement { string Caption; };
+class CIM_RegisteredProfile : CIM_ManagedElement { [Key] string InstanceID; };
+[Association] class CIM_ElementConformsToProfile {
+  [Key] CIM_RegisteredProfile REF ConformantStandard; [Key] CIM_ManagedElement REF ManagedElement; };
+class NRVTAVO_Profile : CIM_RegisteredProfile { };
+class NRVTAVO_Port : CIM_ManagedElement { [Key] string DeviceID; uint16 Speed; };
+class NRVTAVO_Setting : CIM_ManagedElement { [Key] string InstanceID; };
+[Association] class NRVTAVO_PortConforms : CIM_ElementConformsToProfile {
+  [Override ( "ConformantStandard" )] NRVTAVO_Profile REF ConformantStandard;
+  [Override ( "ManagedElement" )] NRVTAVO_Port REF ManagedElement; };
+"""
+
+
+class CimomView(unittest.TestCase):
+    def share(self):
+        with tempfile.TemporaryDirectory() as out:
+            src = os.path.join(out, "t.mof")
+            with open(src, "w") as f:
+                f.write(INTEROP)
+            gen_meta.generate([src], out, share_dir=os.path.join(out, "share"), location="mod")
+            files = {}
+            for root, _, names in os.walk(os.path.join(out, "share")):
+                for n in names:
+                    with open(os.path.join(root, n)) as f:
+                        files[os.path.relpath(os.path.join(root, n), os.path.join(out, "share"))] = f.read()
+            return files
+
+    def test_registration_names_each_provider_with_its_types_and_namespaces(self):
+        entries = {}
+        for block in self.share()["mod.reg"].split("[")[1:]:
+            name, body = block.split("]", 1)
+            entries[name] = dict(line.strip().split(": ", 1) for line in body.strip().splitlines())
+        self.assertEqual(sorted(entries), ["NRVTAVO_Port", "NRVTAVO_PortConforms", "NRVTAVO_Profile",
+                                           "NRVTAVO_Setting"])
+        self.assertEqual(entries["NRVTAVO_Port"], {
+            "provider": "NRVTAVO_Port_Provider", "location": "mod", "type": "instance method",
+            "namespace": "root/norvane"})
+        self.assertEqual(entries["NRVTAVO_Profile"]["namespace"], "root/pg_interop")
+        self.assertEqual(entries["NRVTAVO_PortConforms"]["type"], "instance association method")
+        self.assertEqual(entries["NRVTAVO_PortConforms"]["namespace"], "root/norvane root/pg_interop")
+
+    def test_interop_mof_and_repository_hold_what_the_interop_classes_need(self):
+        files = self.share()
+        interop = files[os.path.join("mof", "mod_pg_interop.mof")]
+        self.assertIn("class NRVTAVO_Port : CIM_ManagedElement", interop)
+        self.assertNotIn("NRVTAVO_Setting", interop)
+        self.assertNotIn("class CIM_", interop)
+        self.assertIn("class NRVTAVO_Setting", files[os.path.join("mof", "mod.mof")])
+        classes = {c["name"]: c for c in json.loads(files["repository.json"])["classes"]}
+        self.assertEqual(classes["NRVTAVO_Setting"]["namespaces"], ["root/norvane"])
+        self.assertEqual(classes["CIM_ManagedElement"]["namespaces"], ["root/norvane", "root/pg_interop"])
+        self.assertEqual(classes["NRVTAVO_PortConforms"]["keys"], [
+            {"name": "ConformantStandard", "type": "ref", "class": "NRVTAVO_Profile"},
+            {"name": "ManagedElement", "type": "ref", "class": "NRVTAVO_Port"}])
+        self.assertEqual(classes["NRVTAVO_Port"]["superclass"], "CIM_ManagedElement")
 
 
 if __name__ == "__main__":
