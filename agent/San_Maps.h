@@ -8,7 +8,7 @@
 // outside every lock.
 #pragma once
 
-#include "agent/Catalogue_Groups.h"
+#include "schema/ProviderClasses.h"
 #include "framework/Instance_Map.h"
 #include "schema/Classes.h"
 
@@ -18,7 +18,7 @@ class ProviderAgent;
 
 struct San_Maps {
 #define NRV_SAN_STAGING_MAP(C) Instance_Map m_##C##_map{&C::static_meta_class};
-  NRV_SAN_CATALOGUE_CLASSES(NRV_SAN_STAGING_MAP)
+  NRV_FOR_EACH_SAN_CATALOGUE_CLASS(NRV_SAN_STAGING_MAP)
 #undef NRV_SAN_STAGING_MAP
 
   // Instances held over all maps.
@@ -31,7 +31,7 @@ Instance_Map& san_map(San_Maps& maps);
 #define NRV_SAN_MAP_OF(C) \
   template <>             \
   inline Instance_Map& san_map<C>(San_Maps & maps) { return maps.m_##C##_map; }
-NRV_SAN_CATALOGUE_CLASSES(NRV_SAN_MAP_OF)
+NRV_FOR_EACH_SAN_CATALOGUE_CLASS(NRV_SAN_MAP_OF)
 #undef NRV_SAN_MAP_OF
 
 // Exchanges every staging map with the agent's; m_SANMapsReadyMutex and

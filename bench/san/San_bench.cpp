@@ -37,7 +37,7 @@ size_t san_rebuild(ProviderAgent& agent) {
 size_t san_instances(ProviderAgent& agent) {
   size_t n = 0;
 #define NRV_BENCH_COUNT(C) n += agent.m_##C##_map.size();
-  NRV_SAN_CATALOGUE_CLASSES(NRV_BENCH_COUNT)
+  NRV_FOR_EACH_SAN_CATALOGUE_CLASS(NRV_BENCH_COUNT)
 #undef NRV_BENCH_COUNT
   return n;
 }
