@@ -151,11 +151,10 @@ TEST_F(Associations, AnUnknownSourceClassAnswersAnEmptySuccess) {
 TEST_F(Associations, AssociationCallsOnAPlainClassFail) {
   CMPIAssociationMI* cards = association_mi(card_slot());
   fake::Result result;
-  EXPECT_EQ(cards->ft->referenceNames(cards, context_, result.get(), chip_path("C1"), nullptr, nullptr).rc,
+  EXPECT_EQ(code_of(cards->ft->referenceNames(cards, context_, result.get(), chip_path("C1"), nullptr, nullptr)),
             CMPI_RC_ERR_FAILED);
-  EXPECT_EQ(cards->ft->associatorNames(cards, context_, result.get(), chip_path("C1"), nullptr, nullptr, nullptr,
-                                       nullptr)
-                .rc,
+  EXPECT_EQ(code_of(cards->ft->associatorNames(cards, context_, result.get(), chip_path("C1"), nullptr, nullptr,
+                                               nullptr, nullptr)),
             CMPI_RC_ERR_FAILED);
 }
 

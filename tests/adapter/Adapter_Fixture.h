@@ -22,6 +22,12 @@ const std::string& trace_home();
 // Everything in the trace file.
 std::string read_traces();
 
+// The code of a status, its message (a broker string) released.
+inline CMPIrc code_of(CMPIStatus status) {
+  if (status.msg) CMRelease(status.msg);
+  return status.rc;
+}
+
 class Adapter_Test : public ::testing::Test {
  protected:
   void SetUp() override;

@@ -163,7 +163,7 @@ TEST_F(Instance_Ops, EnumerationFailuresMapToTheirCodesWithoutDone) {
   EXPECT_EQ(denied.returned().done, 0);
   store().card_enumeration_result = ENUM_INSTANCES_FAILED;
   fake::Result failed;
-  EXPECT_EQ(mi_->ft->enumerateInstances(mi_, context_, failed.get(), path("NRVTAVO_Card"), nullptr).rc,
+  EXPECT_EQ(code_of(mi_->ft->enumerateInstances(mi_, context_, failed.get(), path("NRVTAVO_Card"), nullptr)),
             CMPI_RC_ERR_FAILED);
   EXPECT_EQ(failed.returned().done, 0);
   EXPECT_NE(traces().find("return: enumInstances(): CMPI_RC_ERR_FAILED"), std::string::npos);
