@@ -1,8 +1,9 @@
 // The driver-log readers: the lines of the system log that name a driver,
 // newest first, into that driver's bounded holder.
-#include <deque>
+#include <algorithm>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "agent/ProviderAgent.h"
 #include "logging/Log.h"
@@ -16,19 +17,18 @@ namespace {
 // No syslog line is this long; a longer one is not kept.
 constexpr size_t kMaxLogLine = 64 << 10;
 
-// The newest `wanted` lines of `file` that contain `tag`, oldest first.  The
-// system log may be huge: only as many lines as the holder can still take
-// are ever kept, and the file is read in chunks.
-std::deque<std::string> newest_lines(Regular_File& file, std::string_view tag, size_t wanted) {
-  std::deque<std::string> kept;
-  if (wanted == 0) return kept;
+// The newest `wanted` lines of `file` that contain `tag`, newest first.  The
+// system log may be huge: the file is read in chunks, and the lines go into
+// a ring of `wanted` strings whose storage is reused, so only as many lines
+// as the holder can still take are ever kept.
+std::vector<std::string> newest_lines(Regular_File& file, std::string_view tag, size_t wanted) {
+  if (wanted == 0) return {};
+  std::vector<std::string> ring(wanted);
+  size_t matched = 0;
   std::string line;
   bool overlong = false;
   auto end_line = [&] {
-    if (!overlong && line.find(tag) != std::string::npos) {
-      kept.push_back(std::move(line));
-      if (kept.size() > wanted) kept.pop_front();
-    }
+    if (!overlong && line.find(tag) != std::string::npos) ring[matched++ % wanted].assign(line);
     line.clear();
     overlong = false;
   };
@@ -48,7 +48,9 @@ std::deque<std::string> newest_lines(Regular_File& file, std::string_view tag, s
     }
   }
   if (!line.empty()) end_line();
-  return kept;
+  std::vector<std::string> newest;
+  for (size_t i = 0; i < std::min(matched, wanted); ++i) newest.push_back(std::move(ring[(matched - 1 - i) % wanted]));
+  return newest;
 }
 
 }  // namespace
@@ -62,9 +64,8 @@ void ProviderAgent::readDriverEvents(const char* tag, DeviceLog& holder) {
     const size_t room = holder.size() < static_cast<size_t>(holder.maxCount())
                             ? static_cast<size_t>(holder.maxCount()) - holder.size()
                             : 0;
-    const std::deque<std::string> kept = newest_lines(messages, tag, room);
-    for (auto it = kept.rbegin(); it != kept.rend(); ++it)
-      if (holder.add(*it) != 0) break;  // full
+    for (const std::string& line : newest_lines(messages, tag, room))
+      if (holder.add(line) != 0) break;  // full
   }
   NRV_LOG(NRV_DBG, "Finished reading Events for %s", tag);
 }
