@@ -137,6 +137,8 @@ const char* kindName(EncKind kind) {
     return text;
     NRV_HOST_KIND_NAMES(NRV_HOST_KIND_CASE)
 #undef NRV_HOST_KIND_CASE
+    case EncKind::Memory:  // a block of the memory services is no CMPI object
+      break;
   }
   return "CMPIUnknown";
 }

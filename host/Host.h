@@ -96,8 +96,8 @@ class Host : public Router {
     std::optional<std::string> platformFile = PlatformProvider::pathFromEnvironment();
     // The module's registration and class repository; unset: beside the module when there
     // (shareDirFor), an empty string: none.
-    std::optional<std::string> registrationFile;
-    std::optional<std::string> repositoryFile;
+    std::optional<std::string> registrationFile = std::nullopt;
+    std::optional<std::string> repositoryFile = std::nullopt;
     Cleanup cleanup = Cleanup::EveryMi;
   };
 
@@ -171,8 +171,8 @@ class Host : public Router {
   std::unique_ptr<Dispatch> dispatch_;
   std::string loadError_;
   std::string catalogError_;
-  Cleanup cleanup_;
   PlatformProvider platform_;
+  Cleanup cleanup_;
 
   std::mutex gateMu_;
   std::condition_variable gateCv_;
