@@ -108,7 +108,6 @@ void seedCatalogue(ProviderAgent& agent) {
   }
 }
 
-void buildAdapterData(ProviderAgent& agent) { agent.m_pData->buildAdapterData(); }
 void nothing(ProviderAgent&) {}
 
 }  // namespace
@@ -215,7 +214,11 @@ std::string plainHex(const std::string& text) {
 void FeatureTest::SetUp() {
   ASSERT_EQ(ProviderAgent::peekInstance(), nullptr);
   loadSite(sampleSite());
-  ProviderAgent::useBuilders({buildAdapterData, seedCatalogue, nothing, nothing, nothing});
+  // The real adapter data set; the seeded catalogue; no SAN.
+  Catalogue_Builders builders = ProviderAgent::defaultBuilders();
+  builders.update_adapter_maps = seedCatalogue;
+  builders.build_san_data = builders.update_san_maps = builders.publish_san_maps = nothing;
+  ProviderAgent::useBuilders(builders);
   ASSERT_TRUE(ProviderAgent::acquireLoaded());
   m_Agent = ProviderAgent::peekInstance();
   m_Agent->BuildCimpleInfo();
