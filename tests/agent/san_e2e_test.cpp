@@ -93,8 +93,12 @@ TEST(SanEndToEnd, ALogicalUnitReachesItsPathAndHost) {
       EXPECT_TRUE(has_line_with(ends, "CIM_ComputerSystem")) << path;
       const bool fc = has_line_with(ends, "NRVTAVO_SCSIProtocolInitiatorEndpoint");
       const bool iscsi = has_line_with(ends, "NRVTAVO_iSCSIProtocolEndpoint");
-      if (fc) EXPECT_TRUE(has_line_with(ends, "NRVTAVO_SCSIProtocolEndpoint.")) << path;
-      if (iscsi) EXPECT_TRUE(has_line_with(ends, "NRVTAVO_iSCSITargetProtocolEndpoint")) << path;
+      if (fc) {
+        EXPECT_TRUE(has_line_with(ends, "NRVTAVO_SCSIProtocolEndpoint.")) << path;
+      }
+      if (iscsi) {
+        EXPECT_TRUE(has_line_with(ends, "NRVTAVO_iSCSITargetProtocolEndpoint")) << path;
+      }
     }
   }
   // One tape behind FC, one behind iSCSI: both kinds of path are reached.
