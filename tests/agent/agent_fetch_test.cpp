@@ -275,7 +275,11 @@ TEST_F(FetchTest, DISABLED_ChildAHugeSystemLogIsReadInLittleMemory) {
   const auto fc = agent.m_FCDriverLog.lines();
   ASSERT_EQ(fc.size(), 200u);
   EXPECT_NE(fc.front().find(" line " + std::to_string(lines - 1)), std::string::npos);
+#if !defined(__SANITIZE_ADDRESS__)
+  // ASan's quarantine and shadow memory keep freed chunks resident, so the
+  // peak says nothing about the reader there; the plain build checks it.
   EXPECT_LT(after.ru_maxrss - before.ru_maxrss, 16 * 1024) << "KiB more at the peak";
+#endif
   remove_file(sysroot_path(kNrvSystemLogFile));
 }
 
