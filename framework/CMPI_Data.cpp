@@ -359,6 +359,7 @@ int value_to_cmpi(const CMPI_Env& env, const Value& value, CMPI_Out_Value& out, 
       }
       CMPIStatus set_rc = CMSetArrayElementAt(array, static_cast<CMPICount>(i), &element.value, element.type);
       if (set_rc.rc != CMPI_RC_OK) CIMPLE_WARN("CMSetArrayElementAt() failed");
+      else element.hand_over();  // the array may hold the element itself, not a copy
     }
     return 0;
   });

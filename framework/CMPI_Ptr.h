@@ -50,6 +50,9 @@ class CMPI_Out_Value {
   ~CMPI_Out_Value() { reset(); }
 
   void reset();
+  // Gives the object up without releasing it: the broker made it and frees it when the
+  // request ends.  For an object set into an array, which SFCB keeps by pointer.
+  void hand_over() { type = CMPI_null; }
 
   CMPIValue value;
   CMPIType type = CMPI_null;

@@ -59,6 +59,7 @@ CMPIrc datumFromCmpi(const CMPIValue* value, CMPIType type, Datum& out) {
     auto* a = registry().find<EncArray>(value->array);
     if (a == nullptr) return CMPI_RC_ERR_INVALID_PARAMETER;
     if (a->data.elementType != storedType(base)) return CMPI_RC_ERR_TYPE_MISMATCH;
+    if (!a->elementsLive()) return CMPI_RC_ERR_INVALID_HANDLE;
     out = Datum::arrayOf(a->data.elementType, a->data.elements);
     return CMPI_RC_OK;
   }

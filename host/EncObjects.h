@@ -69,7 +69,14 @@ class EncDateTime : public EncBase<CMPIDateTime, CMPIDateTimeFT, EncKind::DateTi
 class EncArray : public EncBase<CMPIArray, CMPIArrayFT, EncKind::Array> {
  public:
   EncArray(const void* owner, ArrayData data);
+  // False when an object set into an element has been released since. SFCB keeps the
+  // element's handle, not a copy, in an array a provider made, so a provider that releases
+  // an element after setting it leaves SFCB a dangling pointer; the host refuses such an
+  // array where SFCB would crash.
+  bool elementsLive() const;
+
   ArrayData data;
+  std::vector<const void*> setHandles;  // per element: the object set into it, if any
 };
 
 class EncObjectPath : public EncBase<CMPIObjectPath, CMPIObjectPathFT, EncKind::ObjectPath> {

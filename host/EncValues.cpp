@@ -112,6 +112,10 @@ CMPIData arrayGet(const CMPIArray* a, CMPICount index, CMPIStatus* rc) {
     setStatus(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
     return badData();
   }
+  if (!o->elementsLive()) {
+    setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
+    return badData();
+  }
   setStatus(rc, CMPI_RC_OK);
   return datumToCmpi(o->owner(), o->data.elements[index]);
 }
@@ -128,6 +132,9 @@ CMPIStatus arraySet(const CMPIArray* a, CMPICount index, const CMPIValue* value,
   const CMPIrc rc = datumFromCmpi(value, type, d);
   if (rc != CMPI_RC_OK) return makeStatus(rc);
   o->data.elements[index] = std::move(d);
+  o->setHandles.resize(o->data.elements.size());
+  const bool object = (type & CMPI_ENC) != 0 && type != CMPI_chars && value != nullptr;
+  o->setHandles[index] = object ? value->inst : nullptr;
   return makeStatus(CMPI_RC_OK);
 }
 
@@ -198,6 +205,13 @@ EncDateTime::EncDateTime(const void* owner, DateTimeValue v)
 
 EncArray::EncArray(const void* owner, ArrayData d)
     : EncBase(owner, &kArrayFT), data(std::move(d)) {}
+
+bool EncArray::elementsLive() const {
+  for (const void* handle : setHandles) {
+    if (handle != nullptr && !registry().contains(handle)) return false;
+  }
+  return true;
+}
 
 EncEnumeration::EncEnumeration(const void* owner, std::vector<Datum> i)
     : EncBase(owner, &kEnumerationFT), items(std::move(i)) {}

@@ -91,6 +91,10 @@ TEST_F(EncObjectsTest, StringArrayTakesCharsAndStrings) {
   EXPECT_EQ(CMSetArrayElementAt(a, 1, &two, CMPI_string).rc, CMPI_RC_OK);
   EXPECT_STREQ(CMGetCharPtr(CMGetArrayElementAt(a, 0, nullptr).value.string), "one");
   EXPECT_STREQ(CMGetCharPtr(CMGetArrayElementAt(a, 1, nullptr).value.string), "two");
+  // SFCB keeps the element object itself: releasing it leaves the array unusable.
+  CMRelease(two);
+  CMGetArrayElementAt(a, 0, &rc);
+  EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_HANDLE);
 }
 
 TEST_F(EncObjectsTest, DateTimeFormsAgree) {

@@ -21,6 +21,7 @@ XPASS when they agree).
 
 import os
 import re
+import socket
 import sys
 
 # CMPI return codes as nrv-cim names them = CIM status codes as wbemcli prints them.
@@ -86,6 +87,8 @@ def canonical_value(text):
     text = text.strip()
     if text in ("", "NULL", "{}"):
         return None
+    if looks_like_path(text):
+        return (canonical_path(text),)  # a reference as wbemcli prints it: unquoted
     if text.startswith("{") and text.endswith("}"):
         text = text[1:-1]
     return tuple(canonical_scalar(e) for e in split_top(text))
@@ -95,15 +98,34 @@ def looks_like_path(text):
     return re.match(r"^(//[^/]+/|[\w.-]+:\d+/)?[\w/]+:\w+(\.|$)", text) is not None
 
 
+# wbemcli puts the CIMOM's host name before the namespace of the paths associator and
+# reference names answer ("vm/root/x:C.k=1"); a namespace may hold '/' too, so only this
+# machine's names are taken off.
+HOST_PREFIX = re.compile(r"^(//[^/]+/|[\w.-]+:\d+/|(%s)/)" % "|".join(
+    re.escape(h) for h in {socket.gethostname(), socket.gethostname().split(".")[0], "localhost"}))
+
+
+def key_bindings(keys):
+    """(name, value) pairs of a path's keys.  wbemcli prints a reference key's value
+    unquoted, so the referenced path's own keys follow it as if they were the outer path's:
+    they are joined back to the reference they follow."""
+    pairs = []
+    for part in split_top(keys):
+        name, _, value = part.partition("=")
+        value = value.strip()
+        if pairs and pairs[-1][2] and not looks_like_path(value):
+            pairs[-1][1] += "," + part.strip()
+            continue
+        pairs.append([name.strip(), value, not value.startswith('"') and looks_like_path(value)])
+    return [(n, canonical_value(v)) for n, v, _ in pairs]
+
+
 def canonical_path(text):
     """namespace:class.k=v,... with host prefix gone, names lower-cased, keys sorted."""
-    text = re.sub(r"^(//[^/]+/|[\w.-]+:\d+/)", "", text.strip())
+    text = HOST_PREFIX.sub("", text.strip())
     head, _, keys = text.partition(".")
     ns, _, cls = head.rpartition(":")
-    bindings = []
-    for part in split_top(keys) if keys else []:
-        name, _, value = part.partition("=")
-        bindings.append("%s=%s" % (name.strip().lower(), canonical_value(value)))
+    bindings = ["%s=%s" % (name.lower(), value) for name, value in (key_bindings(keys) if keys else [])]
     return "%s:%s.%s" % (ns.lower(), cls.lower(), ",".join(sorted(bindings)))
 
 
