@@ -1,5 +1,6 @@
 #include "logging/NRV_FileLogger.h"
 
+#include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -10,6 +11,23 @@
 #include "logging/NRV_LogLevels.h"
 
 namespace cimple {
+
+// Opens `path` for appending when it is, or becomes, a regular file.  A FIFO
+// would take the lines until its buffer filled and then block every logging
+// thread with the sink's lock held; a device or a directory is no trace file.
+NRV_FileLogger::File NRV_FileLogger::openTraceFile(const char* path, bool truncate) {
+  const int flags = O_RDWR | O_CREAT | O_APPEND | O_NONBLOCK | O_CLOEXEC | (truncate ? O_TRUNC : 0);
+  const int fd = ::open(path, flags, 0644);
+  if (fd < 0) return nullptr;
+  struct stat st;
+  if (::fstat(fd, &st) != 0 || !S_ISREG(st.st_mode) || ::fcntl(fd, F_SETFL, O_RDWR | O_APPEND) != 0) {
+    ::close(fd);
+    return nullptr;
+  }
+  File file(::fdopen(fd, "a+"));
+  if (!file) ::close(fd);
+  return file;
+}
 
 NRV_FileLogger::NRV_FileLogger(CLogger& logger) : m_Logger(logger) {}
 
@@ -36,7 +54,7 @@ void NRV_FileLogger::start() {
   if (!nrv_mode_writes_file(m_Logger.getMode())) return;
   std::lock_guard<std::mutex> lock(m_Mutex);
   m_File.reset();
-  if (!m_Path.empty()) m_File.reset(std::fopen(m_Path.c_str(), "a+"));
+  if (!m_Path.empty()) m_File = openTraceFile(m_Path.c_str(), false);
 }
 
 void NRV_FileLogger::stop() {
@@ -50,9 +68,7 @@ void NRV_FileLogger::clear() {
   std::lock_guard<std::mutex> lock(m_Mutex);
   if (!m_File) return;
   m_File.reset();
-  File truncate(std::fopen(m_Path.c_str(), "w"));
-  truncate.reset();
-  m_File.reset(std::fopen(m_Path.c_str(), "a+"));
+  m_File = openTraceFile(m_Path.c_str(), true);
 }
 
 int NRV_FileLogger::open(const char* path, bool errors_only) {
@@ -63,7 +79,7 @@ int NRV_FileLogger::open(const char* path, bool errors_only) {
   } else if (errno != ENOENT) {
     return -1;
   }
-  File opened(std::fopen(path, "a+"));
+  File opened = openTraceFile(path, false);
   if (!opened) return -1;
   std::lock_guard<std::mutex> lock(m_Mutex);
   m_File = std::move(opened);

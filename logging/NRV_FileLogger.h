@@ -45,6 +45,9 @@ class NRV_FileLogger : public NRV_LoggerInterface {
     void operator()(std::FILE* f) const { std::fclose(f); }
   };
   using File = std::unique_ptr<std::FILE, FileCloser>;
+  // The trace file at `path` opened for appending (emptied first when
+  // `truncate`), or null when it cannot be opened or is not a regular file.
+  static File openTraceFile(const char* path, bool truncate);
 
   CLogger& m_Logger;
   mutable std::mutex m_Mutex;  // guards the three fields below

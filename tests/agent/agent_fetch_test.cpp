@@ -7,6 +7,7 @@
 #include <set>
 #include <string>
 #include <thread>
+#include <vector>
 
 #include "AgentFixture.h"
 #include "logging/Log.h"
@@ -19,6 +20,20 @@ namespace nrv_test {
 namespace {
 
 using namespace cimple;
+
+// Every map of the agent with the class it is bound to: one table row per class keeps the
+// per-class checks below loops rather than hundreds of expanded assertions.
+struct Bound_Map {
+  const char* name;
+  Instance_Map* map;
+  const Meta_Class* own_class;
+};
+
+std::vector<Bound_Map> every_map(ProviderAgent& agent) {
+#define NRV_TEST_BOUND_MAP(C) {#C, &agent_map<C>(agent), &C::static_meta_class},
+  return {NRV_FOR_EACH_PROVIDER_CLASS(NRV_TEST_BOUND_MAP) NRV_HOST_MAPS(NRV_TEST_BOUND_MAP)};
+#undef NRV_TEST_BOUND_MAP
+}
 
 class FetchTest : public AgentTest {
  protected:
@@ -174,19 +189,14 @@ TEST_F(FetchTest, ClearingEmptiesTheGroupsAndKeepsTheSurvivors) {
 #define NRV_TEST_SURVIVOR(C) survivors.insert(#C);
   NRV_SURVIVOR_MAPS(NRV_TEST_SURVIVOR)
 #undef NRV_TEST_SURVIVOR
+  const std::vector<Bound_Map> maps = every_map(agent);
   {
     std::lock_guard<std::recursive_mutex> data(agent.m_DataMutex);
-#define NRV_TEST_FILL(C) ASSERT_GE(agent_map<C>(agent).insert(create(&C::static_meta_class, false)), 0) << #C;
-    NRV_FOR_EACH_PROVIDER_CLASS(NRV_TEST_FILL)
-    NRV_HOST_MAPS(NRV_TEST_FILL)
-#undef NRV_TEST_FILL
+    for (const Bound_Map& m : maps) ASSERT_GE(m.map->insert(create(m.own_class, false)), 0) << m.name;
   }
   capture.reset();
   agent.ClearMaps();
-#define NRV_TEST_CLEARED(C) EXPECT_EQ(agent_map<C>(agent).size(), survivors.count(#C)) << #C;
-  NRV_FOR_EACH_PROVIDER_CLASS(NRV_TEST_CLEARED)
-  NRV_HOST_MAPS(NRV_TEST_CLEARED)
-#undef NRV_TEST_CLEARED
+  for (const Bound_Map& m : maps) EXPECT_EQ(m.map->size(), survivors.count(m.name)) << m.name;
   EXPECT_TRUE(survivors.count("NRVTAVO_ConcreteJob"));
   EXPECT_TRUE(survivors.count("NRVTAVO_iSCSISettingService"));
 
@@ -207,10 +217,7 @@ TEST_F(FetchTest, ClearingEmptiesTheGroupsAndKeepsTheSurvivors) {
 // Every class has its map, bound by class; SAN classes read the SAN catalogue.
 TEST_F(FetchTest, EveryProviderClassHasItsOwnMap) {
   ProviderAgent& agent = start();
-#define NRV_TEST_MAP_CLASS(C) EXPECT_EQ(agent_map<C>(agent).meta_class(), &C::static_meta_class) << #C;
-  NRV_FOR_EACH_PROVIDER_CLASS(NRV_TEST_MAP_CLASS)
-  NRV_HOST_MAPS(NRV_TEST_MAP_CLASS)
-#undef NRV_TEST_MAP_CLASS
+  for (const Bound_Map& m : every_map(agent)) EXPECT_EQ(m.map->meta_class(), m.own_class) << m.name;
   EXPECT_EQ(catalogue_of<NRVTAVO_LogicalDisk>, Catalogue::SAN);
   EXPECT_EQ(catalogue_of<NRVTAVO_iSCSISession>, Catalogue::SAN);
   EXPECT_EQ(catalogue_of<NRVTAVO_HostedISCSIAccesspoint>, Catalogue::SAN);

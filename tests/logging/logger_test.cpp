@@ -228,6 +228,11 @@ TEST_F(LoggerTest, OpenRefusesUnusablePathsAndKeepsTheCurrentFile) {
   EXPECT_EQ(-1, file.open(read_only.c_str(), false));
   EXPECT_EQ(-1, file.open(root.under("/missing/dir/x.log").c_str(), false));
   EXPECT_EQ(-1, logger.setTracePath(root.under("/missing/dir/x.log")));
+  // A FIFO would block every logging thread once its buffer filled.
+  const std::string fifo = root.under("/etc/trace.fifo");
+  ASSERT_EQ(0, ::mkfifo(fifo.c_str(), 0644));
+  EXPECT_EQ(-1, file.open(fifo.c_str(), false));
+  EXPECT_EQ(-1, file.open("/dev/null", false));
 
   EXPECT_EQ(trace, logger.tracePath());
   logger.setMode(NRV_MODE_FILE);

@@ -56,13 +56,14 @@ TEST(ProviderLists, CatalogueAndHandWrittenProvidersSplitTheClasses) {
 TEST(ProviderLists, EveryClassIsBoundToItsProvider) {
   const std::set<std::string> unbuilt(not_yet_built.begin(), not_yet_built.end());
   const std::set<std::string> hand(hand_written.begin(), hand_written.end());
-#define NRV_CHECK(C)                                                                          \
-  {                                                                                           \
-    const bool on_template = std::is_same_v<Provider_For<C>::type, Catalogue_Provider<C>>;   \
-    EXPECT_EQ(on_template, !hand.count(#C) || unbuilt.count(#C)) << #C;                       \
-  }
-  NRV_FOR_EACH_PROVIDER_CLASS(NRV_CHECK)
-#undef NRV_CHECK
+  struct Binding {
+    const char* name;
+    bool on_template;
+  };
+#define NRV_BINDING(C) {#C, std::is_same_v<Provider_For<C>::type, Catalogue_Provider<C>>},
+  const Binding bindings[] = {NRV_FOR_EACH_PROVIDER_CLASS(NRV_BINDING)};
+#undef NRV_BINDING
+  for (const Binding& b : bindings) EXPECT_EQ(b.on_template, !hand.count(b.name) || unbuilt.count(b.name)) << b.name;
   static_assert(std::is_same_v<Provider_For<NRVTAVO_ProviderConfigSetting>::type,
                                NRVTAVO_ProviderConfigSetting_Provider>);
 }
