@@ -176,7 +176,28 @@ stop_sfcbd
 start_sfcbd --append-logs
 ask gi-after-restart gi "$timeout_setting"
 
-# 7. the comparison, and the stage's own checks.
+# 7. an idle unload: with a provider timeout of 4 s SFCB cleans the module up, unloads it and
+# ends its process; the next request loads it again in a new one.
+module_processes() {
+  local p
+  for p in $(pgrep -f "^$P/sbin/sfcbd" || true); do
+    grep -qs libnorvane_tavo_provider "/proc/$p/maps" && echo "$p"
+  done
+}
+stop_sfcbd
+start_sfcbd --append-logs --cfg providerTimeoutInterval=4 --cfg providerSampleInterval=2
+ask ei-cards-before-idle ei root/norvane:NRVTAVO_Card
+[ -n "$(module_processes)" ] || { say "no process holds the module after a request"; exit 1; }
+t=$SECONDS
+for _ in $(seq 60); do [ -z "$(module_processes)" ] && break; sleep 0.5; done
+if [ -n "$(module_processes)" ]; then
+  say "the module's process did not end after 30 s without requests (idle unload)"
+  exit 1
+fi
+say "idle unload: the module's process ended $((SECONDS - t))s after its last request"
+ask ei-cards-after-idle ei root/norvane:NRVTAVO_Card
+
+# 8. the comparison, and the stage's own checks.
 # Set persist_xfail=1 to mark the restart check as expected to fail.
 persist_xfail=
 status=0
