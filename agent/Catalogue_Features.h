@@ -69,6 +69,8 @@ using Feature_Builder = int (*)(Catalogue_Build& build, const Function_View* fun
 // Installs the builder of a feature (null: none).  Features register at
 // module load, before any build runs; the table is not guarded.
 void set_feature_builder(Feature feature, Feature_Builder builder);
+// The builder installed for `feature`, or null.
+Feature_Builder feature_builder(Feature feature);
 
 enum class Feature_Result : uint8_t { kMade, kNotBuilt, kFailed };
 

@@ -74,10 +74,13 @@ def classes_used_by(rc):
 
 def declared_in(schema, provided):
     """Namespace -> lower-case names of the classes declared there: everything in the
-    module's namespace, the closure of what is registered elsewhere."""
+    module's namespace; elsewhere the closure of what is registered there and of the
+    classes whose instances live there (such as the platform's own registered profiles,
+    which the module asks for in the interop namespace)."""
     out = {NAMESPACE: set(schema.classes)}
     for ns in (INTEROP_NAMESPACE,):
         todo = [rc.name for rc in provided if ns in namespaces_of(rc, schema)]
+        todo += [rc.name for rc in schema.order if not rc.is_association() and home_of(rc.name, schema) == ns]
         seen = set()
         while todo:
             rc = schema.lookup(todo.pop())
