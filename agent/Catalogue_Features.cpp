@@ -30,8 +30,13 @@ void feature_update_fru_to_card(ProviderAgent& agent, Instance* card, const std:
                                 const std::string& device_id, size_t index) {
   if (card == nullptr) return;
   Agent_Catalogue catalogue(agent);
-  NRV_Vpd(catalogue).UpdateFRUToCard(*static_cast<NRVTAVO_Card*>(card), asic_id, device_id,
-                                     static_cast<uint32_t>(index));
+  // The caller may still own the card (not yet inserted): nothing may throw past it.
+  try {
+    NRV_Vpd(catalogue).UpdateFRUToCard(*static_cast<NRVTAVO_Card*>(card), asic_id, device_id,
+                                       static_cast<uint32_t>(index));
+  } catch (const std::exception& e) {
+    NRV_LOG(NRV_ERR, "Unable to get the FRU VPD for Card : %s (%s)", device_id.c_str(), e.what());
+  }
 }
 
 int feature_update_fru_to_software(ProviderAgent& agent) {
