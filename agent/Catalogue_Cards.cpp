@@ -117,14 +117,23 @@ Card_Entry* ensure_card(Catalogue_Build& build, const Function_View& fn) {
   NRV_LOG(NRV_DBG, "inside icard %zu", fn.index);
   auto [it, fresh] = build.cards.try_emplace(fn.serial());
   Card_Entry& entry = it->second;
-  if (!fresh) return entry.card ? &entry : nullptr;
+  if (!fresh) {
+    // A further function of the card adds its firmware detail to the card's FRU data.
+    if (entry.card == nullptr) return nullptr;
+    feature_update_fru_to_card(build.agent, entry.card, fn.chip_tag(), fn.name(), fn.index);
+    return &entry;
+  }
   NRV_LOG(NRV_DBG, "create icard instance %zu", fn.index);
-  entry.card = insert_instance(build.agent, make_card(fn), "Insert Failed : m_NRVTAVO_Card_map");
+  ProviderAgent& agent = build.agent;
+  // The FRU data may give the card its final Tag (a key), so it is merged in
+  // before the card map indexes the card by its keys.
+  NRVTAVO_Card* card = make_card(fn);
+  feature_update_fru_to_card(agent, card, fn.chip_tag(), fn.name(), fn.index);
+  entry.card = insert_instance(agent, card, "Insert Failed : m_NRVTAVO_Card_map");
   if (entry.card == nullptr) {
     NRV_LOG(NRV_ERR, "CreateTAVOCardInstance failed");
     return nullptr;
   }
-  ProviderAgent& agent = build.agent;
   const char* serial = fn.serial().c_str();
   associate<NRVTAVO_ChassisContainsCard>(build, serial, build.chassis, entry.card);
   associate<NRVTAVO_CardConformsToProfile>(build, format_text("TAVO Card %s, Access Points", serial),
@@ -133,7 +142,6 @@ Card_Entry* ensure_card(Catalogue_Build& build, const Function_View& fn) {
                                            find_profile(agent, Profile::kHostDiscoveredResources), entry.card);
   associate<NRVTAVO_CardConformsToProfile>(build, format_text("TAVO Card %s, Physical Asset", serial),
                                            find_profile(agent, Profile::kPhysicalAsset), entry.card);
-  feature_update_fru_to_card(agent, entry.card, fn.chip_tag(), fn.name(), fn.index);
 
   NRV_LOG(NRV_DBG, "inside Product %zu", fn.index);
   entry.package = insert_instance(agent, make_package(fn));

@@ -3,15 +3,63 @@
 #include <exception>
 #include <iterator>
 
+#include "access/NRV_Dump.h"
+#include "agent/Agent_Catalogue.h"
+#include "data/NRV_DriverParameters.h"
+#include "data/NRV_PortVirtualization.h"
+#include "data/NRV_Transceiver.h"
+#include "data/NRV_VitalProductData.h"
+#include "data/NRV_Vpd.h"
+#include "schema/Classes.h"
+
 namespace cimple {
 
-Instance* feature_transceiver(ProviderAgent&, const std::string&) { return nullptr; }
-int feature_create_vpd(ProviderAgent&, const std::string&) { return 1; }
-void feature_update_fru_to_card(ProviderAgent&, Instance*, const std::string&, const std::string&, size_t) {}
-int feature_update_fru_to_software(ProviderAgent&) { return 1; }
-void feature_driver_parameters(ProviderAgent&, const std::string&, bool) {}
-int feature_port_virtualization(ProviderAgent&) { return 1; }
-int feature_dump_service(ProviderAgent&) { return 1; }
+// The builders of data/ and access/ see the agent's maps through a catalogue
+// view made for the one call; the caller already holds the data lock.
+Instance* feature_transceiver(ProviderAgent& agent, const std::string& device_id) {
+  Agent_Catalogue catalogue(agent);
+  return GetSffData(catalogue, device_id.c_str());
+}
+
+int feature_create_vpd(ProviderAgent& agent, const std::string& device_id) {
+  Agent_Catalogue catalogue(agent);
+  return CreateVPD(catalogue, device_id.c_str()) == 0 ? 0 : 1;
+}
+
+void feature_update_fru_to_card(ProviderAgent& agent, Instance* card, const std::string& asic_id,
+                                const std::string& device_id, size_t index) {
+  if (card == nullptr) return;
+  Agent_Catalogue catalogue(agent);
+  // The caller may still own the card (not yet inserted): nothing may throw past it.
+  try {
+    NRV_Vpd(catalogue).UpdateFRUToCard(*static_cast<NRVTAVO_Card*>(card), asic_id, device_id,
+                                       static_cast<uint32_t>(index));
+  } catch (const std::exception& e) {
+    NRV_LOG(NRV_ERR, "Unable to get the FRU VPD for Card : %s (%s)", device_id.c_str(), e.what());
+  }
+}
+
+int feature_update_fru_to_software(ProviderAgent& agent) {
+  Agent_Catalogue catalogue(agent);
+  NRV_Vpd(catalogue).UpdateFRUToSoftwareInstance();
+  return 0;
+}
+
+void feature_driver_parameters(ProviderAgent& agent, const std::string& port_name, bool global) {
+  Agent_Catalogue catalogue(agent);
+  FCoEGetDriverParam(catalogue, port_name, global);
+}
+
+int feature_port_virtualization(ProviderAgent& agent) {
+  Agent_Catalogue catalogue(agent);
+  return NRV_PortVirtualization(catalogue).CreatePortVirtualizationClasses() == 0 ? 0 : 1;
+}
+
+int feature_dump_service(ProviderAgent& agent) {
+  Agent_Catalogue catalogue(agent);
+  NRV_Dump(catalogue).CreateDumpServiceClasses();
+  return agent.m_NRVTAVO_DumpService_map.empty() ? 1 : 0;
+}
 
 namespace {
 
@@ -54,6 +102,8 @@ static_assert(std::size(kFeatures) == static_cast<size_t>(Feature::kIscsiCatalog
 void set_feature_builder(Feature feature, Feature_Builder builder) {
   kFeatures[static_cast<size_t>(feature)].builder = builder;
 }
+
+Feature_Builder feature_builder(Feature feature) { return kFeatures[static_cast<size_t>(feature)].builder; }
 
 Feature_Result run_feature(Catalogue_Build& build, Feature feature, const Function_View* function) {
   const Feature_Row& row = kFeatures[static_cast<size_t>(feature)];

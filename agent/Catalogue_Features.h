@@ -22,27 +22,27 @@
 namespace cimple {
 
 // ---- feature data ----------------------------------------------------------
-// The transceiver of the port named `device_id`, already in the Transceiver
-// map, or null.  Filled by the transceiver-data builder (GetSffData).
+// The transceiver of the port named `device_id`, read now and held by the
+// Transceiver map, or null (no module data for the port, or refused).
 Instance* feature_transceiver(ProviderAgent& agent, const std::string& device_id);
 // Adds the function's general VPD to the VitalProductData map (InstanceID =
-// `device_id`); 0 when it did.  Filled by NRV_MethodWrapper::CreateVPD.
+// `device_id`); 0 when it did (or the map held it already).
 int feature_create_vpd(ProviderAgent& agent, const std::string& device_id);
-// Merges the card's FRU data into `card` and its FRU instances.  Filled by
-// NRV_Vpd::UpdateFRUToCard.
+// Merges the card's FRU data into `card` and its FRU instances.  Only a card
+// not yet in the card map takes the FRU UUID as its Tag (a key), so a new card
+// is handed over before it is inserted; a card already there keeps its Tag.
 void feature_update_fru_to_card(ProviderAgent& agent, Instance* card, const std::string& asic_id,
                                 const std::string& device_id, size_t index);
-// Names the firmware identities after their FRU data.  Filled by
-// NRV_Vpd::UpdateFRUToSoftwareInstance.
+// Names the firmware identities after their FRU data; 0 (a failed FRU read
+// leaves that identity as it was).
 int feature_update_fru_to_software(ProviderAgent& agent);
 // The FCoE driver parameters (global, or of the port `port_name`) as setting
-// data.  Filled by NRV_MethodWrapper::FCoEGetDriverParam.
+// data; a failed read is logged by the builder and makes none.
 void feature_driver_parameters(ProviderAgent& agent, const std::string& port_name, bool global);
-// Resource pools and virtual FC ports of every FC port; 0 when made.  Filled
-// by NRV_PortVirtualization::CreatePortVirtualizationClasses.
+// Resource pools and virtual FC ports of every FC port; 0 when every port
+// was served.
 int feature_port_virtualization(ProviderAgent& agent);
-// The dump service and its setting data; 0 when made.  Filled by
-// NRV_Dump::CreateDumpServiceClasses.
+// The dump service and its setting data; 0 when the service exists after.
 int feature_dump_service(ProviderAgent& agent);
 
 // ---- service features ------------------------------------------------------
@@ -69,6 +69,8 @@ using Feature_Builder = int (*)(Catalogue_Build& build, const Function_View* fun
 // Installs the builder of a feature (null: none).  Features register at
 // module load, before any build runs; the table is not guarded.
 void set_feature_builder(Feature feature, Feature_Builder builder);
+// The builder installed for `feature`, or null.
+Feature_Builder feature_builder(Feature feature);
 
 enum class Feature_Result : uint8_t { kMade, kNotBuilt, kFailed };
 

@@ -73,10 +73,13 @@ void NRV_Vpd::UpdateFRUToCard(NRVTAVO_Card& card, const std::string& asicId, con
     setIfPresent(card.SerialNumber, serial);
     setIfPresent(card.PartNumber, NRV_FruRecord::text(fru.PN));
     setIfPresent(card.SKU, NRV_FruRecord::text(fru.FN));
-    // The Tag is a key: changing it under the card map would lose the card there.
+    // The Tag is a key: changing it under the card map would lose the card
+    // there, and a UUID another card already carries (blank or cloned FRU
+    // data) would keep this card out of the map.
+    const std::string uuid = NRV_FruRecord::text(fru.UU);
     const Instance_Map& cards = m_Catalogue.of<NRVTAVO_Card>();
-    if (!findIn<NRVTAVO_Card>(cards, [&](const NRVTAVO_Card& c) { return &c == &card; }))
-      setIfPresent(card.Tag, NRV_FruRecord::text(fru.UU));
+    if (!findIn<NRVTAVO_Card>(cards, [&](const NRVTAVO_Card& c) { return &c == &card || textOf(c.Tag) == uuid; }))
+      setIfPresent(card.Tag, uuid);
     if (!manufacturer.empty()) {
       char name[600];
       if (!serial.empty())

@@ -33,7 +33,8 @@ class NRV_Vpd {
   // new FRU instance with its association; then, once per ASIC identifier,
   // the function's firmware detail into the card's FRU instance.  `index`
   // numbers an adapter without a serial number in its name.  A card already
-  // held by the card map keeps its Tag (the map's key).
+  // held by the card map keeps its Tag (the map's key), and so does a card
+  // whose FRU UUID another card of the map carries as its Tag.
   void UpdateFRUToCard(NRVTAVO_Card& card, const std::string& asicId, const std::string& deviceId,
                        uint32_t index);
 

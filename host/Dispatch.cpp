@@ -75,7 +75,7 @@ std::variant<std::vector<std::string>, Outcome> Dispatch::targets(const Request&
   const bool association = isAssociationOperation(r.op);
   if (registration_ == nullptr) {
     if (!association) return std::vector<std::string>{r.path.className};
-    if (given(r.assocClass)) return std::vector<std::string>{*r.assocClass};
+    if (given(associationFilter(r))) return std::vector<std::string>{*associationFilter(r)};
     return module_.classesWith(MiKind::Association);
   }
   if (auto failure = checkClass(r)) return std::move(*failure);

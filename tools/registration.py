@@ -72,12 +72,17 @@ def classes_used_by(rc):
     return used
 
 
-def declared_in(schema, provided):
+def declared_in(schema, provided, with_platform=False):
     """Namespace -> lower-case names of the classes declared there: everything in the
-    module's namespace, the closure of what is registered elsewhere."""
+    module's namespace, the closure of what is registered elsewhere.  `with_platform`
+    adds the classes whose instances live elsewhere though the module does not serve
+    them (the platform's own registered profiles, which the module asks for in the
+    interop namespace): the CIMOM's schema declares those, never the module's MOF."""
     out = {NAMESPACE: set(schema.classes)}
     for ns in (INTEROP_NAMESPACE,):
         todo = [rc.name for rc in provided if ns in namespaces_of(rc, schema)]
+        if with_platform:
+            todo += [rc.name for rc in schema.order if not rc.is_association() and home_of(rc.name, schema) == ns]
         seen = set()
         while todo:
             rc = schema.lookup(todo.pop())
@@ -139,7 +144,7 @@ def share_files(schema, provided, location):
     """File name (relative to the share folder) -> text."""
     declared = declared_in(schema, provided)
     files = {location + ".reg": registration_text(provided, schema, location),
-             "repository.json": repository_json(schema, declared)}
+             "repository.json": repository_json(schema, declared_in(schema, provided, with_platform=True))}
     for ns, names in declared.items():
         files[os.path.join("mof", mof_file_name(location, ns))] = module_mof(schema, names, location, ns)
     return files

@@ -88,6 +88,41 @@ TEST_F(CatalogueBuild, AFailingISCSICatalogueEndsTheBuildAfterEverythingElse) {
   EXPECT_EQ(count(*wwn), 1u);
 }
 
+// Every hook of the frame logs its failure text while no builder is
+// installed, and again when its builder fails; the build goes on either way.
+TEST_F(CatalogueBuild, EachFeatureHookLogsItsNotSupportedTextWithoutABuilder) {
+  const std::pair<Feature, const char*> kHooks[] = {
+      {Feature::kPhy, "10GBaseT feature is either Not Supported/Failed to Create the feature"},
+      {Feature::kNicSettingService, "NIC Setting Service feature is either Not Supported/Failed to Create the feature"},
+      {Feature::kNicDriverLog, "NIC driver log feature is either Not Supported/Failed to Create the feature"},
+      {Feature::kNicCee, "CEE feature for NIC port is either Not Supported/Failed to Create the feature"},
+      {Feature::kDownPorts, "Down Ethernet port feature is either Not Supported/Failed to Create the feature"},
+      {Feature::kFcPfcThrottle, "PFC throttle feature is either Not Supported/Failed to Create the feature"},
+      {Feature::kFcDriverLog, "FC driver log feature is either Not Supported/Failed to Create the feature"},
+      {Feature::kFcFip, "FIP feature is either Not Supported/Failed to Create the feature"},
+      {Feature::kFcCee, "CEE feature for FCoE port is either Not Supported/Failed to Create the feature"},
+      {Feature::kDiagnostics, "Dignostic Test creation failed"},
+      {Feature::kSrIov, "CreateNICSrIovClasses failed"},
+      {Feature::kChannelManagement, "Updating MC parameters failed"},
+      {Feature::kIscsiCatalogue, "iSCSI discovery failed"},
+  };
+  build_with(real_data);
+  ProviderAgent& agent = *ProviderAgent::peekInstance();
+  std::lock_guard<std::recursive_mutex> data(agent.m_DataMutex);
+  Catalogue_Build build(agent);
+  for (const auto& [feature, text] : kHooks) {
+    const Feature_Builder installed = feature_builder(feature);
+    set_feature_builder(feature, nullptr);
+    capture.reset();
+    EXPECT_EQ(run_feature(build, feature), Feature_Result::kNotBuilt) << text;
+    EXPECT_EQ(capture.count(text, NRV_DBG), 1) << text;
+    set_feature_builder(feature, failing_feature);
+    EXPECT_EQ(run_feature(build, feature), Feature_Result::kFailed) << text;
+    EXPECT_EQ(capture.count(text, NRV_DBG), 2) << text;
+    set_feature_builder(feature, installed);
+  }
+}
+
 TEST_F(CatalogueBuild, TheAssociationBuilderRefusesMissingEndsAndDuplicates) {
   build_with(real_data);
   ProviderAgent& agent = *ProviderAgent::peekInstance();

@@ -121,6 +121,32 @@ const std::map<std::string, size_t> kSampleCounts = {
     {"NRVTAVO_SCSIProtocolInitiatorEndpoint", 2},
     {"NRVTAVO_LocalHostedInitiatorAccessPoint", 2},
     {"NRVTAVO_DeviceSAPImplementation", 2},
+    // The feature data.  Only the two SFP+ ports of the converged card have
+    // a pluggable module (10GBASE-T ports have no SFF data).
+    {"NRVTAVO_Transceiver", 2},
+    {"NRVTAVO_TransceiverComponent", 2},
+    {"NRVTAVO_VitalProductData", 10},  // one per PCI function
+    {"NRVTAVO_ElementVPD", 10},
+    {"NRVTAVO_FRUVitalProductData", 2},  // one per card
+    {"NRVTAVO_FRUElementVPD", 2},
+    // Four values of the four global parameters, and of the two local ones
+    // of the first FCoE port; the second has none of its own.
+    {"NRVTAVO_DriverParameterSettingData", 24},
+    // The first FCoE port has two virtual ports, the second none.
+    {"NRVTAVO_ResourcePool", 1},
+    {"NRVTAVO_HostedResourcePool", 1},
+    {"NRVTAVO_VirtualFCPort", 2},
+    {"NRVTAVO_VPortHostedDependency", 2},
+    {"NRVTAVO_ElementAllocatedFromPool", 2},
+    // One service affecting both chips; the event-log modules of the chips:
+    // FCoE, NIC and iSCSI on the converged card, NIC on the other.
+    {"NRVTAVO_DumpService", 1},
+    {"NRVTAVO_HostedDumpService", 1},
+    {"NRVTAVO_DumpServiceAffectsElement", 2},
+    {"NRVTAVO_ExtFATDumpData", 2},
+    {"NRVTAVO_ElementExtFATDumpData", 2},
+    {"NRVTAVO_ExtFATDumpAdvancedData", 4},
+    {"NRVTAVO_ElementExtFATDumpAdvancedData", 4},
 };
 
 
@@ -227,6 +253,69 @@ TEST_F(CatalogueSite, FromAnFCPortTheWalkReachesStatisticsPCIDeviceAndWWNService
   EXPECT_EQ(statistical, 1u);
 }
 
+// Each association of the feature data, walked from every instance of its
+// near end: associators, their names, references and their names, each
+// filtered by class, find every instance of the association once.
+TEST_F(CatalogueSite, TheFeatureDataIsReachedFromTheDevicesItDescribes) {
+  struct Walk {
+    const char* from;
+    const char* to;
+    const char* association;
+  };
+  const Walk kWalks[] = {
+      {"NRVTAVO_Card", "NRVTAVO_FRUVitalProductData", "NRVTAVO_FRUElementVPD"},
+      {"NRVTAVO_PCIDevice", "NRVTAVO_VitalProductData", "NRVTAVO_ElementVPD"},
+      {"NRVTAVO_PortController", "NRVTAVO_Transceiver", "NRVTAVO_TransceiverComponent"},
+      {"NRVTAVO_FCPort", "NRVTAVO_VirtualFCPort", "NRVTAVO_VPortHostedDependency"},
+      {"NRVTAVO_ResourcePool", "NRVTAVO_VirtualFCPort", "NRVTAVO_ElementAllocatedFromPool"},
+      {"NRVTAVO_Chip", "NRVTAVO_DumpService", "NRVTAVO_DumpServiceAffectsElement"},
+      {"NRVTAVO_Chip", "NRVTAVO_ExtFATDumpData", "NRVTAVO_ElementExtFATDumpData"},
+      {"NRVTAVO_Chip", "NRVTAVO_ExtFATDumpAdvancedData", "NRVTAVO_ElementExtFATDumpAdvancedData"},
+  };
+  for (const Walk& walk : kWalks) {
+    AssocFilter far;
+    far.resultClass = walk.to;
+    far.assocClass = walk.association;
+    AssocFilter links;
+    links.resultClass = walk.association;
+    size_t ai = 0, ain = 0, ri = 0, rin = 0;
+    for (const HostInstance& from : all(walk.from)) {
+      ai += host().associators(from.path, far).instances.size();
+      ain += host().associatorNames(from.path, far).paths.size();
+      for (const HostInstance& r : host().references(from.path, links).instances)
+        ri += r.path.className == walk.association;
+      for (const PathData& p : host().referenceNames(from.path, links).paths) rin += p.className == walk.association;
+    }
+    const size_t expected = kSampleCounts.at(walk.association);
+    EXPECT_EQ(ai, expected) << walk.from << " -> " << walk.to;
+    EXPECT_EQ(ain, expected) << walk.from << " -> " << walk.to;
+    EXPECT_EQ(ri, expected) << walk.from << " -> " << walk.association;
+    EXPECT_EQ(rin, expected) << walk.from << " -> " << walk.association;
+  }
+}
+
+// The converged card's FRU data gives it its Tag (the FRU UUID) before the
+// card map takes it: the card answers to that key, and leads to its FRU data.
+TEST_F(CatalogueSite, ACardAnswersToTheTagItsFRUDataGaveIt) {
+  const PathData card{kNs, "", "NRVTAVO_Card", {{"CreationClassName", Datum::string("NRVTAVO_Card")},
+                                                {"Tag", Datum::string("6a1f0c4e9b2d4d7a8e1c55f3a0b2c719")}}};
+  Result one = host().getInstance(card);
+  ASSERT_TRUE(one.ok()) << one.errorText();
+  ASSERT_EQ(one.instances.size(), 1u);
+  EXPECT_EQ(text(findNamed(one.instances[0].properties, "SKU")), "FRU-5202C-03");
+  EXPECT_EQ(text(findNamed(one.instances[0].properties, "NRVSerialNumber")), "NV52C4213A07719");
+  AssocFilter fru;
+  fru.resultClass = "NRVTAVO_FRUVitalProductData";
+  EXPECT_EQ(host().associatorNames(card, fru).paths.size(), 1u);
+  AssocFilter chips;
+  chips.resultClass = "NRVTAVO_Chip";
+  EXPECT_EQ(host().associatorNames(card, chips).paths.size(), 1u);
+  // The serial number is no longer a key of that card.
+  PathData by_serial = card;
+  by_serial.keys[1].second = Datum::string("NV52C4213A07719");
+  EXPECT_FALSE(host().getInstance(by_serial).ok());
+}
+
 TEST_F(CatalogueSite, PortsCarryTheirIdentitiesAndVNICPairs) {
   size_t with_channel = 0;
   for (const HostInstance& port : all("NRVTAVO_EthernetPort")) {
@@ -267,26 +356,41 @@ TEST(CatalogueWithPlatform, TheHostAndChassisComeFromThePlatform) {
   EXPECT_EQ(text(findNamed(ref(system).keys, "Name")), "host1.example");
 }
 
+// Without the module's registration the host asks every association
+// provider; the result class of a references request still names the one
+// association class to ask.
+TEST(CatalogueUnregistered, ReferencesKeepToTheirResultClass) {
+  Host host(Host::defaultModulePath(), Host::Options{std::nullopt, std::string()});
+  Result chips = host.enumerateInstanceNames(kNs, "NRVTAVO_Chip");
+  ASSERT_TRUE(chips.ok()) << chips.errorText();
+  ASSERT_FALSE(chips.paths.empty());
+  AssocFilter contained;
+  contained.resultClass = "NRVTAVO_CardContainsChip";
+  const std::vector<PathData> names = host.referenceNames(chips.paths[0], contained).paths;
+  ASSERT_EQ(names.size(), 1u);
+  EXPECT_EQ(names[0].className, "NRVTAVO_CardContainsChip");
+  EXPECT_EQ(host.references(chips.paths[0], contained).instances.size(), 1u);
+}
+
 }  // namespace
 
 namespace {
 
 // The platform's Base Server profile references every profile of the module
-// but Profile Registration; without it there are no references.
-// Disabled: since the host routes by the module's registration, the Base
-// Server up-call into "root/pg_interop" answers nothing in the host; to be
-// traced before the test is enabled again.
-TEST(CatalogueWithPlatform, DISABLED_TheBaseServerProfileReferencesTheModulesProfiles) {
+// but Profile Registration; without it there are no references.  Both ends
+// are registered profiles, so the references live in the interop namespace.
+TEST(CatalogueWithPlatform, TheBaseServerProfileReferencesTheModulesProfiles) {
+  constexpr const char* kInterop = "root/pg_interop";
   {
     Host plain(Host::defaultModulePath(), Host::Options{std::nullopt});
-    Result none = plain.enumerateInstances(kNs, "NRVTAVO_BaseServerReferencedProfile");
+    Result none = plain.enumerateInstances(kInterop, "NRVTAVO_BaseServerReferencedProfile");
     ASSERT_TRUE(none.ok()) << none.errorText();
     EXPECT_TRUE(none.instances.empty());
   }
 
   Host host(Host::defaultModulePath(),
             Host::Options{std::string(NRV_HOST_TEST_DATA) + "/platform_base_server.json"});
-  Result refs = host.enumerateInstances(kNs, "NRVTAVO_BaseServerReferencedProfile");
+  Result refs = host.enumerateInstances(kInterop, "NRVTAVO_BaseServerReferencedProfile");
   ASSERT_TRUE(refs.ok()) << refs.errorText();
   ASSERT_EQ(refs.instances.size(), 16u);
   const PathData& base = ref(findNamed(refs.instances[0].properties, "Antecedent"));

@@ -76,6 +76,24 @@ TEST_F(FeatureTest, FruDataWithoutAnFruNumberIsPublishedOncePerCard) {
   EXPECT_EQ(texts(record->ASICId).size(), 6u);
 }
 
+TEST_F(FeatureTest, TwoCardsWithOneFruUuidAreBothKeptEachWithItsOwnFruLink) {
+  nlohmann::json site = sampleSite();
+  site["cards"][1]["fru"] = site["cards"][0]["fru"];
+  loadSite(site);
+  runFeatures(agent());
+  std::lock_guard<std::recursive_mutex> lock(data());
+  ASSERT_EQ(catalogue().of<NRVTAVO_Card>().size(), 2u);
+  expectTexts(cardOf(catalogue(), kCard1), {{"Tag", "6a1f0c4e9b2d4d7a8e1c55f3a0b2c719"}});
+  expectTexts(cardOf(catalogue(), kCard2), {{"Tag", kCard2}});
+  const Instance_Map& links = catalogue().of<NRVTAVO_FRUElementVPD>();
+  ASSERT_EQ(links.size(), 2u);
+  for (size_t i = 0; i < links.size(); ++i) {
+    const auto* link = static_cast<const NRVTAVO_FRUElementVPD*>(links[i]);
+    EXPECT_EQ(textOf(link->ManagedElement->NRVSerialNumber), textOf(link->SettingData->InstanceID));
+    EXPECT_NE(catalogue().of<NRVTAVO_Card>().lookup(link->ManagedElement), nullptr);
+  }
+}
+
 TEST_F(FeatureTest, ACardAlreadyInTheCardMapKeepsItsKey) {
   std::lock_guard<std::recursive_mutex> lock(data());
   Instance_Map& cards = catalogue().of<NRVTAVO_Card>();

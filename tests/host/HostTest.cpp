@@ -191,6 +191,14 @@ TEST_F(HostTest, AssociationFilters) {
   role.role = "Gadget";
   EXPECT_TRUE(host.associatorNames(w1, role).paths.empty());
   EXPECT_TRUE(host.referenceNames(w1, role).paths.empty());
+  // On references the result class names the association class.
+  AssocFilter links;
+  links.resultClass = "TST_WidgetGadget";
+  EXPECT_EQ(host.referenceNames(w1, links).paths.size(), 1u);
+  EXPECT_EQ(host.references(w1, links).instances.size(), 1u);
+  links.resultClass = "TST_Gadget";
+  EXPECT_TRUE(host.referenceNames(w1, links).paths.empty());
+  EXPECT_TRUE(host.references(w1, links).instances.empty());
   AssocFilter unknown;
   unknown.assocClass = "TST_NoSuchAssoc";
   EXPECT_EQ(host.associatorNames(w1, unknown).rc, CMPI_RC_ERR_INVALID_CLASS);

@@ -232,6 +232,7 @@ class CIM_RegisteredProfile : CIM_ManagedElement { [Key] string InstanceID; };
 [Association] class CIM_ElementConformsToProfile {
   [Key] CIM_RegisteredProfile REF ConformantStandard; [Key] CIM_ManagedElement REF ManagedElement; };
 class NRVTAVO_Profile : CIM_RegisteredProfile { };
+class PG_Profile : CIM_RegisteredProfile { };
 class NRVTAVO_Port : CIM_ManagedElement { [Key] string DeviceID; uint16 Speed; };
 class NRVTAVO_Setting : CIM_ManagedElement { [Key] string InstanceID; };
 [Association] class NRVTAVO_PortConforms : CIM_ElementConformsToProfile {
@@ -282,6 +283,10 @@ class CimomView(unittest.TestCase):
             {"name": "ConformantStandard", "type": "ref", "class": "NRVTAVO_Profile"},
             {"name": "ManagedElement", "type": "ref", "class": "NRVTAVO_Port"}])
         self.assertEqual(classes["NRVTAVO_Port"]["superclass"], "CIM_ManagedElement")
+        # The platform's registered profiles are asked for in the interop namespace,
+        # where the CIMOM's schema (never the module's MOF) declares them.
+        self.assertEqual(classes["PG_Profile"]["namespaces"], ["root/norvane", "root/pg_interop"])
+        self.assertNotIn("PG_Profile", interop)
 
 
 if __name__ == "__main__":
