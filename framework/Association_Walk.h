@@ -1,0 +1,36 @@
+// How one association instance answers a references or associators request
+// about a source object: whether it refers to the source, and which of its
+// ends are the far ends.  The generic fallbacks and the providers that answer
+// from an index share these rules, so both give the same answers.
+//
+// Contract: pure functions of their arguments; nothing is kept or owned.
+#pragma once
+
+#include <vector>
+
+#include "framework/Instance.h"
+
+namespace cimple {
+
+// True when `s` names something ("" and null mean "not given").
+inline bool name_given(const char* s) { return s != nullptr && *s != '\0'; }
+
+// The single, not embedded references of an association class, in
+// declaration order.
+std::vector<const Meta_Reference*> single_references(const Meta_Class* mc);
+
+// True when `mr` of `association` points at `source`: its declared class is
+// the source's class or an ancestor, and its target is key_eq to the source.
+bool refers_to(const Instance* association, const Meta_Reference* mr, const Instance* source);
+
+// References: true when a single reference of `association` (named `role`,
+// when given) refers to `source`.
+bool references_source(const Instance* association, const Instance* source, const char* role);
+
+// Associators: the far ends of `association` seen from `source`, filtered by
+// result class and result role, in declaration order; empty when no end
+// (named `role`, when given) is the source.
+std::vector<const Meta_Reference*> far_ends(const Instance* association, const Instance* source,
+                                            const char* result_class, const char* role, const char* result_role);
+
+}  // namespace cimple
