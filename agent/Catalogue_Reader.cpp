@@ -34,6 +34,13 @@ bool copy_map(Instance_Map& map, Instance_Map& snapshot) {
   return true;
 }
 
+void log_failure(const Catalogue_Source& from) {
+  if (from.refresh == nullptr && from.catalogue == Catalogue::SAN)
+    NRV_LOG_AS_AGENT(NRV_CRIT, "Exception in SAN CIM Provider Enumeration - do nothing");
+  else
+    NRV_LOG_AS_AGENT(NRV_CRIT, "Exception in CIM Provider Enumeration - do nothing");
+}
+
 // Runs `work` on the class's map under the locks of its enumeration: the
 // catalogue's ready lock and the data lock, or, for a refreshing class, the
 // data-fetch thread's order of locks around the refresh.  False when nothing
@@ -69,22 +76,25 @@ bool read_map(const Catalogue_Source& from, Work&& work) {
     work(map);
     return true;
   } catch (...) {
-    if (from.refresh == nullptr && from.catalogue == Catalogue::SAN)
-      NRV_LOG_AS_AGENT(NRV_CRIT, "Exception in SAN CIM Provider Enumeration - do nothing");
-    else
-      NRV_LOG_AS_AGENT(NRV_CRIT, "Exception in CIM Provider Enumeration - do nothing");
+    log_failure(from);
     return false;
   }
 }
 
 // Hands each instance to the handler, which owns it from then on; the
-// handler's answer to go on or stop is honoured only when `may_stop`.
-void deliver(std::vector<Instance*>& instances, const Handler& handler, bool may_stop) {
+// handler's answer to go on or stop is honoured only when `may_stop`.  A
+// handler that throws ends the delivery as a failed read.
+void deliver(const Catalogue_Source& from, std::vector<Instance*>& instances, const Handler& handler,
+             bool may_stop) {
   size_t i = 0;
-  while (i < instances.size()) {
-    Instance* instance = instances[i];
-    instances[i++] = nullptr;
-    if (!handler(instance, 0) && may_stop) break;
+  try {
+    while (i < instances.size()) {
+      Instance* instance = instances[i];
+      instances[i++] = nullptr;
+      if (!handler(instance, 0) && may_stop) break;
+    }
+  } catch (...) {
+    log_failure(from);
   }
   for (; i < instances.size(); ++i) unref(instances[i]);
 }
@@ -109,7 +119,7 @@ int enumerate(const Catalogue_Source& from, const Handler& handler) {
     }
   });
   // The handler's answer is not consulted: every instance is delivered.
-  deliver(taken, handler, false);
+  deliver(from, taken, handler, false);
   NRV_LOG(NRV_DBG, "%s_Provider::enum_instances()", from.class_name);
   return ENUM_INSTANCES_OK;
 }
@@ -162,7 +172,7 @@ int catalogue_references(const Catalogue_Source& from, const Instance* source, c
         for (size_t position : map.referring_to(source, role)) taken.push_back(clone(map[position]));
       }))
     release(taken);
-  deliver(taken, handler, true);
+  deliver(from, taken, handler, true);
   NRV_LOG(NRV_DBG, "%s_Provider::enum_references()", from.class_name);
   return ENUM_REFERENCES_OK;
 }
@@ -178,7 +188,7 @@ int catalogue_associator_names(const Catalogue_Source& from, const Instance* sou
         }
       }))
     release(taken);
-  deliver(taken, handler, true);
+  deliver(from, taken, handler, true);
   NRV_LOG(NRV_DBG, "%s_Provider::enum_associator_names()", from.class_name);
   return ENUM_ASSOCIATOR_NAMES_OK;
 }

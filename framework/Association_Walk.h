@@ -15,9 +15,17 @@ namespace cimple {
 // True when `s` names something ("" and null mean "not given").
 inline bool name_given(const char* s) { return s != nullptr && *s != '\0'; }
 
-// The single, not embedded references of an association class, in
-// declaration order.
-std::vector<const Meta_Reference*> single_references(const Meta_Class* mc);
+// Calls `visit` with each single, not embedded reference of an association
+// class, in declaration order, until it answers false.
+template <class Visit>
+void for_each_single_reference(const Meta_Class* mc, Visit&& visit) {
+  for (size_t i = 0; i < mc->num_meta_features; ++i) {
+    const Meta_Feature* mf = mc->meta_features[i];
+    if (!(mf->flags & FLAG_REFERENCE) || is_embedded(mf)) continue;
+    auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
+    if (!is_reference_array(mr) && !visit(mr)) return;
+  }
+}
 
 // True when `mr` of `association` points at `source`: its declared class is
 // the source's class or an ancestor, and its target is key_eq to the source.

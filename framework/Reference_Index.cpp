@@ -21,7 +21,10 @@ bool keys_hash(const Meta_Class* keys, const Instance* instance, size_t& hash) {
 }
 
 Reference_Index::Reference_Index(const Meta_Class* association) {
-  for (const Meta_Reference* mr : single_references(association)) ends_.push_back(End{mr, {}, {}});
+  for_each_single_reference(association, [this](const Meta_Reference* mr) {
+    ends_.push_back(End{mr, {}, {}});
+    return true;
+  });
 }
 
 void Reference_Index::add(const Instance* association, size_t position) {
