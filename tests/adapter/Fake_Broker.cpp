@@ -55,8 +55,8 @@ CMPIData* find_entry(Entries& entries, const char* name) {
 
 void store(Entries& entries, const char* name, const CMPIValue* value, CMPIType type) {
   CMPIData data{type, CMPI_goodValue, {}};
-  if (value) data.value = *value;
-  else data.state = CMPI_nullValue;
+  if (value == nullptr) data.state = CMPI_nullValue;
+  else if (type != CMPI_chars) data.value = *value;  // chars may be shorter than a CMPIValue
   if (type == CMPI_chars) {  // the value pointer is the text, as CIMOMs read it; kept as a string
     data.type = CMPI_string;
     data.value.string = value ? new_string(reinterpret_cast<const char*>(value)) : nullptr;
