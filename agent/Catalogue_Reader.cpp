@@ -2,7 +2,9 @@
 
 #include <exception>
 #include <mutex>
+#include <vector>
 
+#include "framework/Association_Walk.h"
 #include "logging/Log.h"
 
 // The two critical messages of the enumeration belong to the agent's
@@ -32,31 +34,94 @@ bool copy_map(Instance_Map& map, Instance_Map& snapshot) {
   return true;
 }
 
-// Clones the map into `snapshot` under the catalogue's ready lock and the
-// data lock.
-bool take_snapshot(ProviderAgent& agent, Instance_Map& map, Catalogue catalogue, Instance_Map& snapshot) {
-  std::unique_lock<std::mutex> ready =
-      catalogue == Catalogue::SAN ? agent.waitForSANMaps() : agent.waitForAdapterMaps();
-  std::lock_guard<std::recursive_mutex> data(agent.m_DataMutex);
-  return copy_map(map, snapshot);
+void log_failure(const Catalogue_Source& from) {
+  if (from.refresh == nullptr && from.catalogue == Catalogue::SAN)
+    NRV_LOG_AS_AGENT(NRV_CRIT, "Exception in SAN CIM Provider Enumeration - do nothing");
+  else
+    NRV_LOG_AS_AGENT(NRV_CRIT, "Exception in CIM Provider Enumeration - do nothing");
 }
 
-// The refreshing variant: the same order of locks as the data-fetch thread,
-// so that a refresh never sees a half-built data set.
-bool refresh_and_snapshot(ProviderAgent& agent, Instance_Map& map, Status_Refresh refresh, Instance_Map& snapshot) {
-  std::unique_lock<std::mutex> data_ready = agent.waitForAdapterData();
-  std::unique_lock<std::mutex> maps_ready = agent.waitForAdapterMaps();
-  std::lock_guard<std::recursive_mutex> data(agent.m_DataMutex);
-  {
-    std::lock_guard<std::recursive_mutex> own(*refresh.own);
-    refresh.run(agent);
+// Runs `work` on the class's map under the locks of its enumeration: the
+// catalogue's ready lock and the data lock, or, for a refreshing class, the
+// data-fetch thread's order of locks around the refresh.  False when nothing
+// was read: a refreshing class without a loaded agent, or a failure (logged
+// as the enumeration logs it).
+template <class Work>
+bool read_map(const Catalogue_Source& from, Work&& work) {
+  try {
+    ProviderAgent& agent = *ProviderAgent::getInstance();
+    if (from.refresh != nullptr) {
+      if (!agent.m_bIsLoaded) {
+        NRV_LOG(NRV_DBG, "RM Init failed for %s", from.source);
+        return false;
+      }
+      agent.BuildCimpleInfo();
+      Instance_Map& map = from.select(agent);
+      std::unique_lock<std::mutex> data_ready = agent.waitForAdapterData();
+      std::unique_lock<std::mutex> maps_ready = agent.waitForAdapterMaps();
+      std::lock_guard<std::recursive_mutex> data(agent.m_DataMutex);
+      {
+        std::lock_guard<std::recursive_mutex> own(*from.refresh->own);
+        from.refresh->run(agent);
+      }
+      work(map);
+      return true;
+    }
+    if (from.catalogue == Catalogue::SAN) agent.requestSANData();
+    agent.BuildCimpleInfo();
+    Instance_Map& map = from.select(agent);
+    std::unique_lock<std::mutex> ready =
+        from.catalogue == Catalogue::SAN ? agent.waitForSANMaps() : agent.waitForAdapterMaps();
+    std::lock_guard<std::recursive_mutex> data(agent.m_DataMutex);
+    work(map);
+    return true;
+  } catch (...) {
+    log_failure(from);
+    return false;
   }
-  return copy_map(map, snapshot);
 }
 
-void deliver(const Instance_Map& snapshot, const Handler& handler) {
+// Hands each instance to the handler, which owns it from then on; the
+// handler's answer to go on or stop is honoured only when `may_stop`.  A
+// handler that throws ends the delivery as a failed read.
+void deliver(const Catalogue_Source& from, std::vector<Instance*>& instances, const Handler& handler,
+             bool may_stop) {
+  size_t i = 0;
+  try {
+    while (i < instances.size()) {
+      Instance* instance = instances[i];
+      instances[i++] = nullptr;
+      if (!handler(instance, 0) && may_stop) break;
+    }
+  } catch (...) {
+    log_failure(from);
+  }
+  for (; i < instances.size(); ++i) unref(instances[i]);
+}
+
+// A read that failed half-way answers nothing, as its enumeration would.
+void release(std::vector<Instance*>& instances) {
+  for (Instance* instance : instances) unref(instance);
+  instances.clear();
+}
+
+int enumerate(const Catalogue_Source& from, const Handler& handler) {
+  std::vector<Instance*> taken;
+  read_map(from, [&](Instance_Map& map) {
+    Instance_Map snapshot(map.meta_class());
+    if (!copy_map(map, snapshot)) return;
+    // The snapshot's clones are private: they are handed out as they are,
+    // after the locks are released, rather than cloned a second time.
+    taken.reserve(snapshot.size());
+    for (size_t i = 0; i < snapshot.size(); ++i) {
+      ref(snapshot[i]);
+      taken.push_back(snapshot[i]);
+    }
+  });
   // The handler's answer is not consulted: every instance is delivered.
-  for (size_t i = 0; i < snapshot.size(); ++i) handler(clone(snapshot[i]), 0);
+  deliver(from, taken, handler, false);
+  NRV_LOG(NRV_DBG, "%s_Provider::enum_instances()", from.class_name);
+  return ENUM_INSTANCES_OK;
 }
 
 }  // namespace
@@ -70,40 +135,62 @@ int agent_unload(const char* class_name) {
 }
 
 int enumerate_catalogue(const char* class_name, Map_Selector select, Catalogue catalogue, const Handler& handler) {
-  try {
-    ProviderAgent& agent = *ProviderAgent::getInstance();
-    if (catalogue == Catalogue::SAN) agent.requestSANData();
-    agent.BuildCimpleInfo();
-    Instance_Map& map = select(agent);
-    Instance_Map snapshot(map.meta_class());
-    if (take_snapshot(agent, map, catalogue, snapshot)) deliver(snapshot, handler);
-  } catch (...) {
-    if (catalogue == Catalogue::SAN)
-      NRV_LOG_AS_AGENT(NRV_CRIT, "Exception in SAN CIM Provider Enumeration - do nothing");
-    else
-      NRV_LOG_AS_AGENT(NRV_CRIT, "Exception in CIM Provider Enumeration - do nothing");
-  }
-  NRV_LOG(NRV_DBG, "%s_Provider::enum_instances()", class_name);
-  return ENUM_INSTANCES_OK;
+  return enumerate(Catalogue_Source{class_name, select, catalogue}, handler);
 }
 
 int enumerate_refreshed(const char* class_name, const char* source, Map_Selector select, Status_Refresh refresh,
                         const Handler& handler) {
-  try {
-    ProviderAgent& agent = *ProviderAgent::getInstance();
-    if (!agent.m_bIsLoaded) {
-      NRV_LOG(NRV_DBG, "RM Init failed for %s", source);
-      return ENUM_INSTANCES_OK;
-    }
-    agent.BuildCimpleInfo();
-    Instance_Map& map = select(agent);
-    Instance_Map snapshot(map.meta_class());
-    if (refresh_and_snapshot(agent, map, refresh, snapshot)) deliver(snapshot, handler);
-  } catch (...) {
-    NRV_LOG_AS_AGENT(NRV_CRIT, "Exception in CIM Provider Enumeration - do nothing");
+  return enumerate(Catalogue_Source{class_name, select, Catalogue::Adapter, &refresh, source}, handler);
+}
+
+int get_catalogue_instance(const Catalogue_Source& from, const Instance* model, Instance*& instance) {
+  Instance* found = nullptr;
+  if (model != nullptr) {
+    read_map(from, [&](Instance_Map& map) {
+      const Instance* stored = nullptr;
+      if (model->meta_class == map.meta_class()) {
+        stored = map.lookup(model);
+      } else {
+        // A model of another class (an ancestor named by the CIMOM) hashes
+        // its keys differently: compare in map order, as an enumeration would.
+        for (size_t i = 0; i < map.size() && stored == nullptr; ++i)
+          if (key_eq(map[i], model)) stored = map[i];
+      }
+      if (stored != nullptr) found = clone(stored);
+    });
   }
-  NRV_LOG(NRV_DBG, "%s_Provider::enum_instances()", class_name);
-  return ENUM_INSTANCES_OK;
+  NRV_LOG(NRV_DBG, "%s_Provider::get_instance()", from.class_name);
+  if (found == nullptr) return GET_INSTANCE_NOT_FOUND;
+  instance = found;
+  return GET_INSTANCE_OK;
+}
+
+int catalogue_references(const Catalogue_Source& from, const Instance* source, const char* role,
+                         const Handler& handler) {
+  std::vector<Instance*> taken;
+  if (source != nullptr && !read_map(from, [&](Instance_Map& map) {
+        for (size_t position : map.referring_to(source, role)) taken.push_back(clone(map[position]));
+      }))
+    release(taken);
+  deliver(from, taken, handler, true);
+  NRV_LOG(NRV_DBG, "%s_Provider::enum_references()", from.class_name);
+  return ENUM_REFERENCES_OK;
+}
+
+int catalogue_associator_names(const Catalogue_Source& from, const Instance* source, const char* result_class,
+                               const char* role, const char* result_role, const Handler& handler) {
+  std::vector<Instance*> taken;
+  if (source != nullptr && !read_map(from, [&](Instance_Map& map) {
+        for (size_t position : map.referring_to(source, role)) {
+          const Instance* association = map[position];
+          for (const Meta_Reference* mr : far_ends(association, source, result_class, role, result_role))
+            taken.push_back(clone(reference_of(association, mr)));
+        }
+      }))
+    release(taken);
+  deliver(from, taken, handler, true);
+  NRV_LOG(NRV_DBG, "%s_Provider::enum_associator_names()", from.class_name);
+  return ENUM_ASSOCIATOR_NAMES_OK;
 }
 
 }  // namespace cimple

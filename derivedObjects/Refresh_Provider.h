@@ -1,7 +1,8 @@
 // Refresh_Provider<C, Refresh>: the catalogue provider of a class whose
 // volatile values (link state, speeds, temperature, statistics, driver
 // parameters) are refreshed in its map, at most once per interval, just
-// before the map is copied out.  Everything else is Catalogue_Provider<C>'s.
+// before the map is copied out or an instance is looked up in it.
+// Everything else is Catalogue_Provider<C>'s.
 //
 // Contract: the refresh runs under the agent's locks in the data-fetch
 // thread's order, then under this provider's own recursive mutex, one per
@@ -19,9 +20,20 @@ template <class C, void (*Refresh)(ProviderAgent&)>
 class Refresh_Provider : public Catalogue_Provider<C> {
  public:
   int enum_instances(const Instance*, const Handler& handler) {
+    return enumerate_refreshed(C::static_meta_class.name, kSource, &agent_map<C>, refresh(), handler);
+  }
+  int get_instance(const Instance* model, Instance*& instance) {
+    if (generic_reads()) return GET_INSTANCE_UNSUPPORTED;
+    const Status_Refresh run = refresh();
+    return get_catalogue_instance({C::static_meta_class.name, &agent_map<C>, Catalogue::Adapter, &run, kSource},
+                                  model, instance);
+  }
+
+ private:
+  static constexpr const char* kSource = "Refresh_Provider.h";
+  static Status_Refresh refresh() {
     static std::recursive_mutex own;  // lives until the module is unloaded, after its last request
-    return enumerate_refreshed(C::static_meta_class.name, "Refresh_Provider.h", &agent_map<C>,
-                               Status_Refresh{Refresh, &own}, handler);
+    return Status_Refresh{Refresh, &own};
   }
 };
 

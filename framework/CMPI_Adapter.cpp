@@ -95,7 +95,37 @@ CMPI_Adapter::CMPI_Adapter(CMPI_Static_Data* record, const Provider_Registration
 CMPI_Adapter::~CMPI_Adapter() {
   CIMPLE_DBG("~CMPI_Adapter");
   if (record_ && record_->adapter == this) record_->adapter = nullptr;
+  for (auto& [mc, provider] : module_providers_) {
+    if (!provider) continue;
+    provider->unload();
+    provider->destroy_provider();
+  }
   handle_.destroy_provider();
+}
+
+CMPI_Adapter::Route CMPI_Adapter::route(const Meta_Class* mc, const std::string& name_space) const {
+  auto it = routes_.find({mc, name_space});
+  return it == routes_.end() ? Route::Unknown : it->second;
+}
+
+void CMPI_Adapter::learn_route(const Meta_Class* mc, const std::string& name_space, Route route) {
+  routes_[{mc, name_space}] = route;
+}
+
+Provider_Handle* CMPI_Adapter::module_provider(const Meta_Class* mc) {
+  if (mc == nullptr) return nullptr;
+  auto [it, fresh] = module_providers_.try_emplace(mc);
+  if (fresh) {
+    for (const Provider_Registration* r = cimple_module(); r; r = r->next) {
+      if (r->meta_class != mc) continue;
+      auto provider = std::make_unique<Provider_Handle>(r);
+      if (provider->create_provider() != 0 || provider->provider() == nullptr) break;
+      provider->load();  // a failed load still leaves the provider to answer, as in its own adapter
+      it->second = std::move(provider);
+      break;
+    }
+  }
+  return it->second.get();
 }
 
 void CMPI_Adapter::fill_tables(const char* provider_name) {

@@ -50,6 +50,20 @@ class CMPI_Adapter {
   // Any class of the module's repository named by `path`, else null.
   const Meta_Class* repository_class(const CMPIObjectPath* path) const;
 
+  // The provider of class `mc` when the module serves it, else null: a
+  // provider object of its own, created and loaded on first use and unloaded
+  // when this adapter ends, so that an association reads its far ends
+  // in-process rather than through the CIMOM.  Called under mutex().
+  Provider_Handle* module_provider(const Meta_Class* mc);
+
+  // Whether the CIMOM serves class `mc` in `name_space`, as the adapter has
+  // learnt it from the first fetch of such an object through the broker: a
+  // far end is read in-process only where the CIMOM would route its fetch to
+  // the module, so both ways answer alike.
+  enum class Route { Unknown, Module, Elsewhere };
+  Route route(const Meta_Class* mc, const std::string& name_space) const;
+  void learn_route(const Meta_Class* mc, const std::string& name_space, Route route);
+
   // Name spaces with active indication filters, with their counts.
   void activate_filter(const std::string& name_space);
   void deactivate_filter(const std::string& name_space);
@@ -71,6 +85,8 @@ class CMPI_Adapter {
   int load_count_ = 0;
   bool unload_allowed_ = false;
   std::map<std::string, int> filters_;
+  std::map<const Meta_Class*, std::unique_ptr<Provider_Handle>> module_providers_;  // null: not the module's
+  std::map<std::pair<const Meta_Class*, std::string>, Route> routes_;
   Mutex mutex_;
 };
 

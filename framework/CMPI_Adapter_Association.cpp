@@ -2,6 +2,7 @@
 // result objects only (no returnDone), as the association table requires.
 #include "framework/CMPI_Adapter.h"
 #include "framework/CMPI_Delivery.h"
+#include "framework/Generic_Reads.h"
 
 namespace cimple {
 
@@ -38,6 +39,56 @@ constexpr Result_Map kReferencesResults[] = {{ENUM_REFERENCES_OK, CMPI_RC_OK},
                                              {ENUM_REFERENCES_UNSUPPORTED, CMPI_RC_ERR_NOT_SUPPORTED},
                                              {ENUM_REFERENCES_ACCESS_DENIED, CMPI_RC_ERR_ACCESS_DENIED}};
 
+// The far ends of an associators request.  One the module serves is read
+// in-process from its class's provider, as a getInstance of its path would
+// read it, once the CIMOM has shown (by the first fetch of its class in its
+// name space) that it routes such a fetch to the module; the others (the
+// platform's, or where the CIMOM does not serve the class) are fetched.
+struct Far_End_Reads {
+  CMPI_Adapter* adapter;
+  CMPI_Delivery delivery;
+};
+
+bool fetch_far_end(Far_End_Reads& reads, Instance* instance, int status, Provider_Handle* provider) {
+  CMPI_Delivery& delivery = reads.delivery;
+  const std::string ns = delivery.name_space_for(instance);
+  const Meta_Class* mc = instance->meta_class;
+  const bool fetched = deliver_fetched_instance(instance, status, &delivery);
+  if (provider != nullptr && reads.adapter->route(mc, ns) == CMPI_Adapter::Route::Unknown) {
+    if (fetched)
+      reads.adapter->learn_route(mc, ns, CMPI_Adapter::Route::Module);
+    else if (delivery.error == CMPI_RC_ERR_INVALID_CLASS || delivery.error == CMPI_RC_ERR_INVALID_NAMESPACE)
+      reads.adapter->learn_route(mc, ns, CMPI_Adapter::Route::Elsewhere);
+  }
+  return fetched;
+}
+
+bool deliver_far_end(Instance* instance, int status, void* data) {
+  auto& reads = *static_cast<Far_End_Reads*>(data);
+  CMPI_Delivery& delivery = reads.delivery;
+  if (instance == nullptr || delivery.error != CMPI_RC_OK || delivery.result == nullptr)
+    return deliver_fetched_instance(instance, status, &delivery);  // releases and stops
+  Provider_Handle* provider = generic_reads() ? nullptr : reads.adapter->module_provider(instance->meta_class);
+  const std::string ns = delivery.name_space_for(instance);
+  if (provider == nullptr || reads.adapter->route(instance->meta_class, ns) != CMPI_Adapter::Route::Module)
+    return fetch_far_end(reads, instance, status, provider);
+  Instance_Ptr owned(instance);
+  CMPI_Ptr<CMPIObjectPath> path;
+  CMPIrc rc = make_cmpi_object_path(delivery.broker, instance, ns.c_str(), path);
+  int result = -1;
+  CMPI_Ptr<CMPIInstance> far_end;
+  if (rc == CMPI_RC_OK)
+    rc = read_instance(CMPI_Env{delivery.broker, reads.adapter->repository(), ns.c_str()}, *provider,
+                       instance->meta_class, path.get(), delivery.properties, result, far_end);
+  if (rc == CMPI_RC_OK && result != GET_INSTANCE_OK) rc = CMPI_RC_ERR_NOT_FOUND;
+  if (rc != CMPI_RC_OK) {
+    delivery.error = rc;  // as a failed fetch: the walk stops
+    return false;
+  }
+  CMReturnInstance(delivery.result, far_end.get());
+  return true;
+}
+
 CMPIStatus associator_names(CMPIAssociationMI* mi, const CMPIContext* ctx, const CMPIResult* rslt,
                             const CMPIObjectPath* path, const char*, const char* result_class, const char* role,
                             const char* result_role) {
@@ -72,12 +123,12 @@ CMPIStatus associators(CMPIAssociationMI* mi, const CMPIContext* ctx, const CMPI
     int result = handle.enum_associators(source.get(), given(result_class), given(role), given(result_role),
                                          deliver_instance, &delivery);
     if (result != ENUM_ASSOCIATORS_UNSUPPORTED) return call.finish_result(result, kAssociatorsResults);
-    // The provider knows only the far ends' keys: fetch each whole object
-    // from the CIMOM, which routes to the far end's own provider.
-    CMPI_Delivery fetch{call.broker(), ctx, rslt, ns.c_str(), properties};
-    fetch.own_name_space = true;
+    // The provider knows only the far ends' keys: read each whole object
+    // from its own provider.
+    Far_End_Reads fetch{call.adapter(), CMPI_Delivery{call.broker(), ctx, rslt, ns.c_str(), properties}};
+    fetch.delivery.own_name_space = true;
     result = handle.enum_associator_names(source.get(), given(result_class), given(role), given(result_role),
-                                          deliver_fetched_instance, &fetch);
+                                          deliver_far_end, &fetch);
     return call.finish_result(result, kAssociatorNamesResults);
   });
 }

@@ -100,19 +100,14 @@ CMPIStatus get_instance(CMPIInstanceMI* mi, const CMPIContext* ctx, const CMPIRe
   if (!call.adapter()) return kNoAdapter;
   return run(call, [&]() -> CMPIStatus {
     const std::string ns = name_space_of(path);
-    Instance_Ptr model;
-    if (CMPIrc rc = read_model(call, path, ns, rslt, properties, model); rc != CMPI_RC_OK) return call.finish(rc);
-    Instance* found = nullptr;
-    int result = call.adapter()->handle().get_instance(model.get(), found);
-    Instance_Ptr instance(found);
-    if (result == GET_INSTANCE_OK && !instance) result = -1;  // a success without an instance answers nothing
-    if (result != GET_INSTANCE_OK) return call.finish_result(result, kGetResults);
-    CMPI_Ptr<CMPIObjectPath> out_path;
+    const Meta_Class* mc = call.adapter()->served_class(path);
+    if (mc == nullptr) return call.finish(CMPI_RC_ERR_FAILED);
+    if (rslt == nullptr) return call.finish(CMPI_RC_ERR_INVALID_PARAMETER);
+    int result = -1;
     CMPI_Ptr<CMPIInstance> out;
-    CMPIrc rc = make_cmpi_object_path(call.broker(), instance.get(), ns.c_str(), out_path);
-    if (rc == CMPI_RC_OK)
-      rc = make_cmpi_instance(call.broker(), instance.get(), ns.c_str(), out_path.get(), properties, out);
+    CMPIrc rc = read_instance(env_of(call, ns), call.adapter()->handle(), mc, path, properties, result, out);
     if (rc != CMPI_RC_OK) return call.finish(rc);
+    if (result != GET_INSTANCE_OK) return call.finish_result(result, kGetResults);
     CMReturnInstance(rslt, out.get());
     CMReturnDone(rslt);
     return call.finish(CMPI_RC_OK);

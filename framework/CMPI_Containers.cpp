@@ -18,6 +18,15 @@ int CMPI_Container::take_name(CMPIString* name, const CMPIStatus& rc, std::strin
 
 namespace {
 
+// A scalar string value as CMPI_chars, whose value pointer is the C string
+// itself (as CIMOMs read it): setting a property or key then makes no
+// CMPIString to be created and released around it.  Null for other values.
+const char* scalar_chars(const Value& value) {
+  if (value.is_array()) return nullptr;
+  const String* s = value.get<String>();
+  return s ? s->c_str() : nullptr;
+}
+
 size_t count_or_zero(CMPICount count, const CMPIStatus& rc) { return rc.rc == CMPI_RC_OK ? count : 0; }
 
 bool is_empty_instance_array(const Value& value) {
@@ -51,6 +60,11 @@ int CMPIObjectPath_Container::get_value(size_t pos, int type, const Meta_Feature
 }
 
 int CMPIObjectPath_Container::set_value(const char* name, const Value& value, uint32_t flags) {
+  if (const char* chars = scalar_chars(value)) {
+    if (CMAddKey(path_, name, reinterpret_cast<const CMPIValue*>(chars), CMPI_chars).rc == CMPI_RC_OK) return 0;
+    CIMPLE_WARN("CMAddKey() failed");
+    return -1;
+  }
   CMPI_Out_Value out;
   if (value_to_cmpi(env_, value, out, flags) != 0) {
     CIMPLE_WARN("_to_cmpi_data() failed: feature=%s", name);
@@ -93,6 +107,12 @@ int CMPIInstance_Container::set_value(const char* name, const Value& value, uint
   // CMPI_RC_ERR_TYPE_MISMATCH, and the explicit null it accepts goes out in a
   // form Debian's wbemcli cannot parse; an unset property goes out empty.
   if ((flags & (FLAG_EMBEDDED_INSTANCE | FLAG_EMBEDDED_OBJECT)) && is_empty_instance_array(value)) return 0;
+  if (const char* chars = scalar_chars(value)) {
+    if (CMSetProperty(instance_, name, reinterpret_cast<const CMPIValue*>(chars), CMPI_chars).rc == CMPI_RC_OK)
+      return 0;
+    CIMPLE_WARN("CMSetProperty() failed: %s", name);
+    return -1;
+  }
   CMPI_Out_Value out;
   if (value_to_cmpi(env_, value, out, flags) != 0) {
     CIMPLE_WARN("_to_cmpi_data() failed: feature=%s", name);

@@ -66,6 +66,27 @@ bool deliver_fetched_instance(Instance* instance, int, void* data) {
   return true;
 }
 
+CMPIrc read_instance(const CMPI_Env& env, Provider_Handle& handle, const Meta_Class* mc, const CMPIObjectPath* path,
+                     const char* const* properties, int& result, CMPI_Ptr<CMPIInstance>& out) {
+  result = -1;
+  Instance* keys = nullptr;
+  CMPIrc rc = make_cimple_reference(env, mc, path, keys);
+  Instance_Ptr model(keys);
+  if (rc != CMPI_RC_OK) return rc;
+  // Keys kept: they say which instance is wanted.
+  if (apply_property_list(model.get(), properties, true) != 0) return CMPI_RC_ERR_INVALID_PARAMETER;
+  Instance* found = nullptr;
+  result = handle.get_instance(model.get(), found);
+  Instance_Ptr instance(found);
+  if (result == GET_INSTANCE_OK && !instance) result = -1;  // a success without an instance answers nothing
+  if (result != GET_INSTANCE_OK) return CMPI_RC_OK;
+  CMPI_Ptr<CMPIObjectPath> out_path;
+  rc = make_cmpi_object_path(env.broker, instance.get(), env.name_space, out_path);
+  if (rc == CMPI_RC_OK)
+    rc = make_cmpi_instance(env.broker, instance.get(), env.name_space, out_path.get(), properties, out);
+  return rc;
+}
+
 std::string name_space_of(const CMPIObjectPath* path) {
   if (path == nullptr) return {};
   CMPIStatus rc{CMPI_RC_OK, nullptr};

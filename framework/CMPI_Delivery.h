@@ -12,6 +12,7 @@
 #include <string>
 
 #include "framework/Converter.h"
+#include "framework/Provider_Handle.h"
 
 namespace cimple {
 
@@ -41,6 +42,14 @@ bool deliver_instance(Instance* instance, int status, void* data);
 // Fetches each delivered object from the CIMOM (getInstance with the list)
 // and returns what it gets; a failed fetch stops the walk.
 bool deliver_fetched_instance(Instance* instance, int status, void* data);
+
+// What a getInstance of `path` (class `mc`) in `name_space` answers through
+// `handle`: the model made from the path's keys with the property list
+// applied, the provider's (or the fallback's) answer in `result`, and, when
+// that is GET_INSTANCE_OK, the instance as the CIMOM gets it in `out`.  A
+// conversion failure is answered as its own code.
+CMPIrc read_instance(const CMPI_Env& env, Provider_Handle& handle, const Meta_Class* mc, const CMPIObjectPath* path,
+                     const char* const* properties, int& result, CMPI_Ptr<CMPIInstance>& out);
 
 // The name space of an object path ("" when it has none).
 std::string name_space_of(const CMPIObjectPath* path);

@@ -30,6 +30,8 @@ size_t value_hash(const T& v) {
   }
 }
 
+}  // namespace
+
 size_t property_hash(const Instance* instance, const Meta_Property* mp) {
   size_t h = *null_flag(instance, mp);
   return visit_type(mp->type, [&](auto tag) {
@@ -40,8 +42,6 @@ size_t property_hash(const Instance* instance, const Meta_Property* mp) {
     return h;
   });
 }
-
-}  // namespace
 
 size_t key_hash(const Instance* instance) {
   size_t h = 0;
@@ -59,6 +59,16 @@ size_t key_hash(const Instance* instance) {
     }
   }
   return h;
+}
+
+Instance_Map::Instance_Map(const Meta_Class* meta_class) : meta_class_(meta_class) {
+  if (meta_class != nullptr && (meta_class->flags & FLAG_ASSOCIATION))
+    references_ = std::make_unique<Reference_Index>(meta_class);
+}
+
+std::vector<size_t> Instance_Map::referring_to(const Instance* source, const char* role) const {
+  if (!references_ || source == nullptr) return {};
+  return references_->referring_to(instances_, source, role);
 }
 
 long Instance_Map::find(const Instance* keys) const {
@@ -87,6 +97,7 @@ long Instance_Map::insert(Instance* instance) {
   if (find(instance, hash) >= 0) return -1;
   instances_.push_back(instance);
   index(hash, instances_.size() - 1);
+  if (references_) references_->add(instance, instances_.size() - 1);
   return static_cast<long>(instances_.size() - 1);
 }
 
@@ -122,6 +133,7 @@ int Instance_Map::modify_instance(const Instance* model, const Instance* instanc
   Instance* stored = lookup(instance);
   if (stored == nullptr) return MODIFY_INSTANCE_NOT_FOUND;
   copy(stored, instance, false, model);
+  if (references_) rebuild_index();  // its ends may have moved
   return MODIFY_INSTANCE_OK;
 }
 
@@ -149,11 +161,16 @@ void Instance_Map::clear() {
   for (Instance* instance : instances_) unref(instance);
   instances_.clear();
   index_.clear();
+  if (references_) references_->clear();
 }
 
 void Instance_Map::rebuild_index() {
   index_.clear();
-  for (size_t i = 0; i < instances_.size(); ++i) index(key_hash(instances_[i]), i);
+  if (references_) references_->clear();
+  for (size_t i = 0; i < instances_.size(); ++i) {
+    index(key_hash(instances_[i]), i);
+    if (references_) references_->add(instances_[i], i);
+  }
 }
 
 }  // namespace cimple

@@ -2,7 +2,8 @@
 // by the map, answering provider operations with the provider result codes.
 // Look-ups go through an open-addressing index of key hashes, so n inserts and
 // n look-ups cost O(n) and touch a stored instance only when its hash matches;
-// equality is still decided by key_eq.
+// equality is still decided by key_eq.  The map of an association class also
+// keeps a Reference_Index of its instances' ends.
 //
 // Not synchronised: the owner serialises access.  Instances handed out are
 // clones; instances handed in are taken over (insert) or copied (create).
@@ -10,19 +11,23 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <vector>
 
 #include "framework/Instance.h"
 #include "framework/Provider.h"
+#include "framework/Reference_Index.h"
 
 namespace cimple {
 
 // Hash of an instance's key values, consistent with key_eq.
 size_t key_hash(const Instance* instance);
+// Hash of one property's value and null flag, consistent with key_eq.
+size_t property_hash(const Instance* instance, const Meta_Property* mp);
 
 class Instance_Map {
  public:
-  explicit Instance_Map(const Meta_Class* meta_class) : meta_class_(meta_class) {}
+  explicit Instance_Map(const Meta_Class* meta_class);
   Instance_Map(const Instance_Map&) = delete;
   Instance_Map& operator=(const Instance_Map&) = delete;
   ~Instance_Map() { clear(); }
@@ -46,6 +51,11 @@ class Instance_Map {
   // status 0; stops early when the handler answers false.  Answers 0.
   int enum_instances(const Handler& handler) const;
 
+  // Association maps: positions, ascending, of the instances referring to
+  // `source` through a single reference (named `role` when given), as
+  // Association_Walk.h's references_source decides.  Other maps: none.
+  std::vector<size_t> referring_to(const Instance* source, const char* role) const;
+
   void remove(size_t index);
   void clear();
   // Exchanges the contents with `other`, a map of the same class, in O(1):
@@ -53,6 +63,7 @@ class Instance_Map {
   void swap(Instance_Map& other) noexcept {
     instances_.swap(other.instances_);
     index_.swap(other.index_);
+    references_.swap(other.references_);
   }
 
  private:
@@ -68,6 +79,7 @@ class Instance_Map {
   const Meta_Class* meta_class_;
   std::vector<Instance*> instances_;
   std::vector<Slot> index_;  // power-of-two size, at most half full
+  std::unique_ptr<Reference_Index> references_;  // association classes only
 };
 
 }  // namespace cimple

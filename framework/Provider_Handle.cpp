@@ -1,6 +1,6 @@
 #include "framework/Provider_Handle.h"
 
-#include <vector>
+#include "framework/Association_Walk.h"
 
 namespace cimple {
 
@@ -23,15 +23,6 @@ bool find_matching(Instance* instance, int, void* data) {
   return true;
 }
 
-// True when `mr` (a single reference of `association`) points at `source`.
-bool refers_to(const Instance* association, const Meta_Reference* mr, const Instance* source) {
-  if (!is_subclass(mr->meta_class, source->meta_class)) return false;
-  const Instance* target = reference_of(association, mr);
-  return target != nullptr && key_eq(target, source);
-}
-
-bool name_given(const char* s) { return s != nullptr && *s != '\0'; }
-
 struct References_Walk {
   const Instance* source;
   const char* role;
@@ -42,14 +33,7 @@ struct References_Walk {
 bool pass_references(Instance* association, int, void* data) {
   auto* walk = static_cast<References_Walk*>(data);
   if (association == nullptr) return false;
-  const Meta_Class* mc = association->meta_class;
-  for (size_t i = 0; i < mc->num_meta_features; ++i) {
-    const Meta_Feature* mf = mc->meta_features[i];
-    if (!(mf->flags & FLAG_REFERENCE) || is_embedded(mf)) continue;
-    auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
-    if (is_reference_array(mr) || (name_given(walk->role) && !equal_nocase(mr->name, walk->role))) continue;
-    if (refers_to(association, mr, walk->source)) return walk->proc(association, 0, walk->data);
-  }
+  if (references_source(association, walk->source, walk->role)) return walk->proc(association, 0, walk->data);
   unref(association);
   return true;
 }
@@ -63,44 +47,15 @@ struct Associator_Walk {
   void* data;
 };
 
-bool class_named_or_ancestor(const char* name, const Meta_Class* mc) {
-  for (const Meta_Class* p = mc; p; p = p->super_meta_class)
-    if (equal_nocase(p->name, name)) return true;
-  return false;
-}
-
 bool pass_associators(Instance* association, int, void* data) {
   auto* walk = static_cast<Associator_Walk*>(data);
   if (association == nullptr) return false;
-  const Meta_Class* mc = association->meta_class;
-  bool has_source = false;
-  std::vector<const Meta_Reference*> far_ends;
-  for (size_t i = 0; i < mc->num_meta_features; ++i) {
-    const Meta_Feature* mf = mc->meta_features[i];
-    if (!(mf->flags & FLAG_REFERENCE) || is_embedded(mf)) continue;
-    auto* mr = reinterpret_cast<const Meta_Reference*>(mf);
-    if (is_reference_array(mr)) continue;
-    if (!has_source && refers_to(association, mr, walk->source)) {
-      if (!name_given(walk->role) || equal_nocase(mr->name, walk->role)) {
-        has_source = true;
-        continue;
-      }
-      continue;  // matches the source but not the role: neither end
-    }
-    const Instance* target = reference_of(association, mr);
-    if (target == nullptr) continue;
-    if (name_given(walk->result_class) && !class_named_or_ancestor(walk->result_class, target->meta_class))
-      continue;
-    if (name_given(walk->result_role) && !equal_nocase(mr->name, walk->result_role)) continue;
-    far_ends.push_back(mr);
-  }
   bool go_on = true;
-  if (has_source) {
-    for (const Meta_Reference* mr : far_ends) {
-      Instance* far_end = reference_of(association, mr);
-      ref(far_end);
-      if (!(go_on = walk->proc(far_end, 0, walk->data))) break;
-    }
+  for (const Meta_Reference* mr :
+       far_ends(association, walk->source, walk->result_class, walk->role, walk->result_role)) {
+    Instance* far_end = reference_of(association, mr);
+    ref(far_end);
+    if (!(go_on = walk->proc(far_end, 0, walk->data))) break;
   }
   unref(association);
   return go_on;

@@ -26,9 +26,7 @@ void add_uint16(const CMPIArgs* args, const char* name, CMPIUint16 v) {
 }
 
 void add_chars(const CMPIArgs* args, const char* name, const char* text) {
-  CMPIValue value;
-  value.chars = const_cast<char*>(text);
-  CMAddArg(args, name, &value, CMPI_chars);
+  CMAddArg(args, name, text, CMPI_chars);
 }
 
 TEST_F(Methods, ParametersArriveAndTheReturnValueComesBackTwice) {
@@ -158,9 +156,7 @@ TEST_F(Methods, ArraysAndReferenceParametersArriveAndNullElementsAreSkipped) {
 TEST_F(Methods, AWronglyTypedArrayIsSkippedNotCrashed) {
   CMPIArgs* in = args();
   CMPIArray* values = fake::new_array(1, CMPI_string);
-  CMPIValue v;
-  v.chars = const_cast<char*>("10");
-  CMSetArrayElementAt(values, 0, &v, CMPI_chars);
+  CMSetArrayElementAt(values, 0, "10", CMPI_chars);
   CMPIValue array;
   array.array = values;
   CMAddArg(in, "MinBWValues", &array, CMPI_stringA);

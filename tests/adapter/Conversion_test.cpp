@@ -114,11 +114,8 @@ const Meta_Method kCountMethod = {0, FLAG_METHOD, "SetCount", 0, nullptr, kParam
 
 TEST_F(Conversions, AUint64ParameterGivenAsTextIsRefusedAndStaysNull) {
   CMPIArgs* in = args();
-  CMPIValue text;
-  text.chars = const_cast<char*>("12");
-  CMAddArg(in, "Count", &text, CMPI_chars);
-  text.chars = const_cast<char*>("TRUE please");
-  CMAddArg(in, "Flag", &text, CMPI_chars);
+  CMAddArg(in, "Count", "12", CMPI_chars);
+  CMAddArg(in, "Flag", "TRUE please", CMPI_chars);
   Instance* record = nullptr;
   ASSERT_EQ(make_cimple_method(CMPI_Env{broker_.get(), nullptr, kNs}, &kCountMethod, nullptr, in, record),
             CMPI_RC_OK);

@@ -55,11 +55,11 @@ CMPIData* find_entry(Entries& entries, const char* name) {
 
 void store(Entries& entries, const char* name, const CMPIValue* value, CMPIType type) {
   CMPIData data{type, CMPI_goodValue, {}};
-  if (value) data.value = *value;
-  else data.state = CMPI_nullValue;
-  if (type == CMPI_chars) {  // a CIMOM keeps text as a string
+  if (value == nullptr) data.state = CMPI_nullValue;
+  else if (type != CMPI_chars) data.value = *value;  // chars may be shorter than a CMPIValue
+  if (type == CMPI_chars) {  // the value pointer is the text, as CIMOMs read it; kept as a string
     data.type = CMPI_string;
-    data.value.string = value && value->chars ? new_string(value->chars) : nullptr;
+    data.value.string = value ? new_string(reinterpret_cast<const char*>(value)) : nullptr;
   } else {
     data = copy_data(data);
   }
@@ -472,9 +472,7 @@ CMPIContext* new_context(const char* principal) {
   c->hdl = c;
   c->ft = &kContextFT;
   if (principal) {
-    CMPIValue v;
-    v.chars = const_cast<char*>(principal);
-    store(c->entries, CMPIPrincipal, &v, CMPI_chars);
+    store(c->entries, CMPIPrincipal, reinterpret_cast<const CMPIValue*>(principal), CMPI_chars);
   }
   return c;
 }
@@ -487,15 +485,11 @@ std::string text_of(const CMPIData& data) {
 }
 
 void add_string_key(const CMPIObjectPath* path, const char* name, const char* value) {
-  CMPIValue v;
-  v.chars = const_cast<char*>(value);
-  path_add_key(path, name, &v, CMPI_chars);
+  path_add_key(path, name, reinterpret_cast<const CMPIValue*>(value), CMPI_chars);
 }
 
 void set_string_property(const CMPIInstance* instance, const char* name, const char* value) {
-  CMPIValue v;
-  v.chars = const_cast<char*>(value);
-  instance_set(instance, name, &v, CMPI_chars);
+  instance_set(instance, name, reinterpret_cast<const CMPIValue*>(value), CMPI_chars);
 }
 
 std::string class_of(const CMPIObjectPath* path) { return as_path(path)->cn; }
