@@ -67,7 +67,7 @@ void BM_AdapterRebuild(benchmark::State& state) {
 
 bool run(const std::string& scale) {
   // The agent without its data-fetch thread: the benchmark drives the build.
-  ProviderAgent::useBuilders({nothing, nothing, nothing, nothing, nothing});
+  ProviderAgent::useBuilders({nothing, nothing, nothing, nothing, nothing, nothing});
   if (!ProviderAgent::acquireLoaded()) return false;
   benchmark::RegisterBenchmark(("BM_AdapterRebuild/x" + scale).c_str(), BM_AdapterRebuild)
       ->Unit(benchmark::kMillisecond);
