@@ -108,7 +108,8 @@ void release(std::vector<Instance*>& instances) {
 int enumerate(const Catalogue_Source& from, const Handler& handler) {
   std::vector<Instance*> taken;
   read_map(from, [&](Instance_Map& map) {
-    Instance_Map snapshot(map.meta_class());
+    // The snapshot only checks the keys and is handed out: no reference index.
+    Instance_Map snapshot(map.meta_class(), false);
     if (!copy_map(map, snapshot)) return;
     // The snapshot's clones are private: they are handed out as they are,
     // after the locks are released, rather than cloned a second time.

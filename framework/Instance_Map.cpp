@@ -61,8 +61,8 @@ size_t key_hash(const Instance* instance) {
   return h;
 }
 
-Instance_Map::Instance_Map(const Meta_Class* meta_class) : meta_class_(meta_class) {
-  if (meta_class != nullptr && (meta_class->flags & FLAG_ASSOCIATION))
+Instance_Map::Instance_Map(const Meta_Class* meta_class, bool index_references) : meta_class_(meta_class) {
+  if (index_references && meta_class != nullptr && (meta_class->flags & FLAG_ASSOCIATION))
     references_ = std::make_unique<Reference_Index>(meta_class);
 }
 

@@ -27,7 +27,9 @@ size_t property_hash(const Instance* instance, const Meta_Property* mp);
 
 class Instance_Map {
  public:
-  explicit Instance_Map(const Meta_Class* meta_class);
+  // `index_references`: whether an association map keeps its Reference_Index
+  // (a short-lived copy that is only enumerated has no use for one).
+  explicit Instance_Map(const Meta_Class* meta_class, bool index_references = true);
   Instance_Map(const Instance_Map&) = delete;
   Instance_Map& operator=(const Instance_Map&) = delete;
   ~Instance_Map() { clear(); }
