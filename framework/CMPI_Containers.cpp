@@ -59,12 +59,14 @@ int CMPIObjectPath_Container::get_value(size_t pos, int type, const Meta_Feature
   return cmpi_to_value(env_, feature ? feature->name : "", data, type, feature, value);
 }
 
+int CMPIObjectPath_Container::set_chars(const char* name, const char* chars, uint32_t) {
+  if (CMAddKey(path_, name, reinterpret_cast<const CMPIValue*>(chars), CMPI_chars).rc == CMPI_RC_OK) return 0;
+  CIMPLE_WARN("CMAddKey() failed");
+  return -1;
+}
+
 int CMPIObjectPath_Container::set_value(const char* name, const Value& value, uint32_t flags) {
-  if (const char* chars = scalar_chars(value)) {
-    if (CMAddKey(path_, name, reinterpret_cast<const CMPIValue*>(chars), CMPI_chars).rc == CMPI_RC_OK) return 0;
-    CIMPLE_WARN("CMAddKey() failed");
-    return -1;
-  }
+  if (const char* chars = scalar_chars(value)) return set_chars(name, chars, flags);
   CMPI_Out_Value out;
   if (value_to_cmpi(env_, value, out, flags) != 0) {
     CIMPLE_WARN("_to_cmpi_data() failed: feature=%s", name);
@@ -100,6 +102,13 @@ int CMPIInstance_Container::get_value(size_t pos, int type, const Meta_Feature* 
   return cmpi_to_value(env_, feature ? feature->name : "", data, type, feature, value);
 }
 
+int CMPIInstance_Container::set_chars(const char* name, const char* chars, uint32_t) {
+  if (CMSetProperty(instance_, name, reinterpret_cast<const CMPIValue*>(chars), CMPI_chars).rc == CMPI_RC_OK)
+    return 0;
+  CIMPLE_WARN("CMSetProperty() failed: %s", name);
+  return -1;
+}
+
 int CMPIInstance_Container::set_value(const char* name, const Value& value, uint32_t flags) {
   // An empty embedded array is how an instance says "none" (its slot has no
   // null flag), so the property stays unset, that is null.  SFCB refuses
@@ -107,12 +116,7 @@ int CMPIInstance_Container::set_value(const char* name, const Value& value, uint
   // CMPI_RC_ERR_TYPE_MISMATCH, and the explicit null it accepts goes out in a
   // form Debian's wbemcli cannot parse; an unset property goes out empty.
   if ((flags & (FLAG_EMBEDDED_INSTANCE | FLAG_EMBEDDED_OBJECT)) && is_empty_instance_array(value)) return 0;
-  if (const char* chars = scalar_chars(value)) {
-    if (CMSetProperty(instance_, name, reinterpret_cast<const CMPIValue*>(chars), CMPI_chars).rc == CMPI_RC_OK)
-      return 0;
-    CIMPLE_WARN("CMSetProperty() failed: %s", name);
-    return -1;
-  }
+  if (const char* chars = scalar_chars(value)) return set_chars(name, chars, flags);
   CMPI_Out_Value out;
   if (value_to_cmpi(env_, value, out, flags) != 0) {
     CIMPLE_WARN("_to_cmpi_data() failed: feature=%s", name);

@@ -33,6 +33,7 @@ class CMPIObjectPath_Container : public CMPI_Container {
   int get_name(size_t pos, std::string& name) override;
   int get_value(size_t pos, int type, const Meta_Feature* feature, Value& value) override;
   int set_value(const char* name, const Value& value, uint32_t flags) override;
+  int set_chars(const char* name, const char* chars, uint32_t flags) override;
 
  private:
   const CMPIObjectPath* path_;
@@ -46,6 +47,7 @@ class CMPIInstance_Container : public CMPI_Container {
   int get_name(size_t pos, std::string& name) override;
   int get_value(size_t pos, int type, const Meta_Feature* feature, Value& value) override;
   int set_value(const char* name, const Value& value, uint32_t flags) override;
+  int set_chars(const char* name, const char* chars, uint32_t flags) override;
 
  private:
   const CMPIInstance* instance_;

@@ -352,6 +352,14 @@ int value_to_cmpi(const CMPI_Env& env, const Value& value, CMPI_Out_Value& out, 
       if constexpr (std::is_same_v<T, Instance*>) {
         if (elements[i] == nullptr) continue;  // stays a null element
       }
+      if constexpr (std::is_same_v<T, String>) {
+        // As CMPI_chars (the value pointer is the C string, as CIMOMs read it) the CIMOM
+        // makes the element itself: no CMPIString to create, hand over and track.
+        const auto* chars = reinterpret_cast<const CMPIValue*>(elements[i].c_str());
+        if (CMSetArrayElementAt(array, static_cast<CMPICount>(i), chars, CMPI_chars).rc != CMPI_RC_OK)
+          CIMPLE_WARN("CMSetArrayElementAt() failed");
+        continue;
+      }
       CMPI_Out_Value element;
       if (element_to_cmpi(env, elements[i], embedded, element) != 0) {
         CIMPLE_WARN("element conversion failed");

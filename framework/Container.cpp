@@ -19,7 +19,21 @@ bool feature_is_null(const Instance* instance, const Meta_Feature* feature) {
   return !is_reference_array(mr) && reference_of(instance, mr) == nullptr;
 }
 
+// The string a scalar string property holds; null for every other feature.
+const String* scalar_string(const Instance* instance, const Meta_Feature* feature) {
+  if (!(feature->flags & FLAG_PROPERTY)) return nullptr;
+  auto* mp = reinterpret_cast<const Meta_Property*>(feature);
+  if (mp->type != STRING || is_array(mp)) return nullptr;
+  return static_cast<const String*>(slot(instance, mp->offset));
+}
+
 }  // namespace
+
+int Container::set_chars(const char* name, const char* chars, uint32_t flags) {
+  Value value;
+  value.set(String(chars));
+  return set_value(name, value, flags);
+}
 
 int Container::convert(const Meta_Class* mc, uint32_t mask, Instance*& instance) {
   if (instance == nullptr) {
@@ -61,6 +75,11 @@ int Container::convert(const Instance* instance, uint32_t mask) {
     const Meta_Feature* feature = mc->meta_features[i];
     if (feature->flags & FLAG_METHOD) continue;
     if (masked_out(feature, mask) || feature_is_null(instance, feature)) continue;
+    if (const String* text = scalar_string(instance, feature)) {
+      if (set_chars(feature->name, text->c_str(), feature->flags) != 0)
+        CIMPLE_WARN("conversion error: %s.%s", mc->name, feature->name);
+      continue;
+    }
     Value value;
     if (value.get_feature(instance, feature) != 0) {
       CIMPLE_WARN("unexpected failure: %s.%s", mc->name, feature->name);

@@ -27,6 +27,9 @@ class Container {
   // feature it is meant for (references need its class).  0 or -1.
   virtual int get_value(size_t pos, int type, const Meta_Feature* feature, Value& value) = 0;
   virtual int set_value(const char* name, const Value& value, uint32_t flags) = 0;
+  // A scalar string, which is most of what an instance holds, set without
+  // a Value (that is, without copying it); by default through set_value.
+  virtual int set_chars(const char* name, const char* chars, uint32_t flags);
 
   // Container to instance: fills the features (restricted to those with a
   // flag of `mask`, when non-zero) of `instance`; when `instance` is null,

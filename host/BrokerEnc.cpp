@@ -30,12 +30,16 @@ T* refuse(CMPIStatus* rc, CMPIrc code) {
   return nullptr;
 }
 
+constexpr size_t kTypicalPropertyCount = 24;
+
 CMPIInstance* newInstance(const CMPIBroker* mb, const CMPIObjectPath* op, CMPIStatus* rc) {
   if (!validBroker(mb, rc)) return nullptr;
   auto path = pathOf(op);
   if (!path) return refuse<CMPIInstance>(rc, CMPI_RC_ERR_INVALID_PARAMETER);
   InstanceData data;
   data.path = std::move(*path);
+  // Room for a typical instance's properties, so that setting them moves none.
+  data.properties.reserve(kTypicalPropertyCount);
   setStatus(rc, CMPI_RC_OK);
   return makeInstance(mb, std::move(data));
 }
@@ -149,7 +153,7 @@ std::string describe(EncObject& o) {
     case EncKind::DateTime: return static_cast<EncDateTime&>(o).value.text();
     case EncKind::ObjectPath: return formatPath(static_cast<EncObjectPath&>(o).data);
     case EncKind::Instance:
-      return formatValue(Datum::embedded(static_cast<EncInstance&>(o).data));
+      return formatValue(Datum::embedded(static_cast<EncInstance&>(o).share()));
     case EncKind::Array: {
       auto& a = static_cast<EncArray&>(o).data;
       return formatValue(Datum::arrayOf(a.elementType, a.elements));

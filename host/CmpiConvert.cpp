@@ -111,7 +111,7 @@ CMPIrc datumFromCmpi(const CMPIValue* value, CMPIType type, Datum& out) {
       }
       auto* i = registry().find<EncInstance>(value->inst);
       if (i == nullptr) return CMPI_RC_ERR_INVALID_PARAMETER;
-      out = Datum::embedded(i->data);
+      out = Datum::embedded(i->share());
       return CMPI_RC_OK;
     }
     default:
@@ -156,7 +156,12 @@ std::optional<PathData> pathOf(const CMPIObjectPath* op) {
 std::optional<InstanceData> instanceOf(const CMPIInstance* inst) {
   auto* o = registry().find<EncInstance>(inst);
   if (o == nullptr) return std::nullopt;
-  return o->data;
+  return o->data();
+}
+
+std::shared_ptr<const InstanceData> sharedInstanceOf(const CMPIInstance* inst) {
+  auto* o = registry().find<EncInstance>(inst);
+  return o == nullptr ? nullptr : o->share();
 }
 
 std::optional<NamedData> argsOf(const CMPIArgs* args) {

@@ -204,11 +204,13 @@ Datum Datum::reference(PathData value) {
   return d;
 }
 
-Datum Datum::embedded(InstanceData value) {
+Datum Datum::embedded(InstanceData value) { return embedded(std::make_shared<InstanceData>(std::move(value))); }
+
+Datum Datum::embedded(std::shared_ptr<const InstanceData> value) {
   Datum d;
   d.type = CMPI_instance;
   d.isNull = false;
-  d.instance = std::make_shared<const InstanceData>(std::move(value));
+  d.instance = std::move(value);
   return d;
 }
 
@@ -283,14 +285,14 @@ const Datum* findNamed(const NamedData& list, const std::string& name) {
   return nullptr;
 }
 
-void setNamed(NamedData& list, const std::string& name, Datum value) {
+void setNamed(NamedData& list, std::string name, Datum value) {
   for (auto& [n, v] : list) {
     if (sameName(n, name)) {
       v = std::move(value);
       return;
     }
   }
-  list.emplace_back(name, std::move(value));
+  list.emplace_back(std::move(name), std::move(value));
 }
 
 bool PathData::operator==(const PathData& o) const {

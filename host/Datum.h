@@ -53,6 +53,8 @@ struct Datum {
   static Datum real(CMPIType type, double value);
   static Datum reference(PathData value);
   static Datum embedded(InstanceData value);
+  // Shares the instance; it must not change while the Datum holds it.
+  static Datum embedded(std::shared_ptr<const InstanceData> value);
   static Datum time(DateTimeValue value);
   static Datum arrayOf(CMPIType elementType, std::vector<Datum> elements);
 
@@ -68,7 +70,7 @@ using NamedData = std::vector<std::pair<std::string, Datum>>;
 bool sameName(const std::string& a, const std::string& b);
 const Datum* findNamed(const NamedData& list, const std::string& name);
 // Replaces an entry of the same name in place, else appends.
-void setNamed(NamedData& list, const std::string& name, Datum value);
+void setNamed(NamedData& list, std::string name, Datum value);
 
 struct PathData {
   std::string nameSpace;

@@ -42,6 +42,8 @@ const std::optional<std::string>& associationFilter(const Request& r) {
 
 bool given(const std::optional<std::string>& s) { return s && !s->empty(); }
 
+constexpr size_t kMaxFanouts = 4096;
+
 }  // namespace
 
 Dispatch::Dispatch(const ModuleLoader& module, const Registration* registration,
@@ -62,12 +64,20 @@ std::optional<Outcome> Dispatch::checkClass(const Request& r) const {
 std::vector<std::string> Dispatch::registered(const std::string& nameSpace,
                                               const std::string& type,
                                               const std::optional<std::string>& filter) const {
+  Fanout key{nameSpace, type, filter};
+  {
+    std::lock_guard<std::mutex> lock(fanoutMu_);
+    if (auto it = fanouts_.find(key); it != fanouts_.end()) return it->second;
+  }
   std::vector<std::string> out;
   for (auto& cls : registration_->classesIn(nameSpace, type)) {
     const bool match = !given(filter) ||
                        (repository_ ? repository_->isA(cls, *filter) : sameName(cls, *filter));
     if (match) out.push_back(std::move(cls));
   }
+  std::lock_guard<std::mutex> lock(fanoutMu_);
+  if (fanouts_.size() >= kMaxFanouts) fanouts_.clear();  // names a client made up stay bounded
+  fanouts_.emplace(std::move(key), out);
   return out;
 }
 

@@ -9,7 +9,10 @@
 #ifndef NRV_HOST_DISPATCH_H
 #define NRV_HOST_DISPATCH_H
 
+#include <map>
+#include <mutex>
 #include <string>
+#include <tuple>
 #include <variant>
 #include <vector>
 
@@ -43,6 +46,11 @@ class Dispatch {
   const ModuleLoader& module_;
   const Registration* registration_;
   const ClassRepository* repository_;
+  // registered() answers, by namespace, type and filter: registration and repository do not
+  // change once loaded, and walking every class's ancestry is most of a small request's cost.
+  using Fanout = std::tuple<std::string, std::string, std::optional<std::string>>;
+  mutable std::mutex fanoutMu_;
+  mutable std::map<Fanout, std::vector<std::string>> fanouts_;
 };
 
 }  // namespace nrv::host

@@ -111,9 +111,9 @@ CMPIStatus returnData(const CMPIResult* r, const CMPIValue* value, const CMPITyp
 
 CMPIStatus returnInstance(const CMPIResult* r, const CMPIInstance* inst) {
   if (registry().find<EncResult>(r) == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
-  auto data = instanceOf(inst);
+  auto data = sharedInstanceOf(inst);
   if (!data) return makeStatus(CMPI_RC_ERR_INVALID_PARAMETER);
-  return deliver(r, Datum::embedded(std::move(*data)));
+  return deliver(r, Datum::embedded(std::move(data)));
 }
 
 CMPIStatus returnObjectPath(const CMPIResult* r, const CMPIObjectPath* op) {

@@ -23,7 +23,7 @@ CMPIInstance* instClone(const CMPIInstance* inst, CMPIStatus* rc) {
     return nullptr;
   }
   setStatus(rc, CMPI_RC_OK);
-  return makeInstance(o->owner(), o->data, true);
+  return makeInstance(o->owner(), o->data(), true);
 }
 
 CMPIData instGet(const CMPIInstance* inst, const char* name, CMPIStatus* rc) {
@@ -32,7 +32,7 @@ CMPIData instGet(const CMPIInstance* inst, const char* name, CMPIStatus* rc) {
     setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
     return badData();
   }
-  return namedGet(o->owner(), o->data.properties, name, rc);
+  return namedGet(o->owner(), o->data().properties, name, rc);
 }
 
 CMPIData instGetAt(const CMPIInstance* inst, CMPICount index, CMPIString** name,
@@ -42,13 +42,13 @@ CMPIData instGetAt(const CMPIInstance* inst, CMPICount index, CMPIString** name,
     setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
     return badData();
   }
-  return namedAt(o->owner(), o->data.properties, index, name, rc);
+  return namedAt(o->owner(), o->data().properties, index, name, rc);
 }
 
 CMPICount instCount(const CMPIInstance* inst, CMPIStatus* rc) {
   auto* o = live(inst);
   setStatus(rc, o == nullptr ? CMPI_RC_ERR_INVALID_HANDLE : CMPI_RC_OK);
-  return o == nullptr ? 0 : static_cast<CMPICount>(o->data.properties.size());
+  return o == nullptr ? 0 : static_cast<CMPICount>(o->data().properties.size());
 }
 
 CMPIStatus instSet(const CMPIInstance* inst, const char* name, const CMPIValue* value,
@@ -60,8 +60,8 @@ CMPIStatus instSet(const CMPIInstance* inst, const char* name, const CMPIValue* 
   const CMPIrc rc = datumFromCmpi(value, type, d);
   if (rc != CMPI_RC_OK) return makeStatus(rc);
   // A filtered-out property is silently dropped, as the filter promises the caller.
-  if (!o->data.admits(name)) return makeStatus(CMPI_RC_OK);
-  setNamed(o->data.properties, name, std::move(d));
+  if (!o->data().admits(name)) return makeStatus(CMPI_RC_OK);
+  setNamed(o->edit().properties, name, std::move(d));
   return makeStatus(CMPI_RC_OK);
 }
 
@@ -86,7 +86,7 @@ CMPIObjectPath* instPath(const CMPIInstance* inst, CMPIStatus* rc) {
     return nullptr;
   }
   setStatus(rc, CMPI_RC_OK);
-  return makeObjectPath(o->owner(), currentPath(o->data));
+  return makeObjectPath(o->owner(), currentPath(o->data()));
 }
 
 CMPIStatus instSetPath(const CMPIInstance* inst, const CMPIObjectPath* op) {
@@ -94,7 +94,7 @@ CMPIStatus instSetPath(const CMPIInstance* inst, const CMPIObjectPath* op) {
   if (o == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
   auto path = pathOf(op);
   if (!path) return makeStatus(CMPI_RC_ERR_INVALID_PARAMETER);
-  o->data.path = std::move(*path);
+  o->edit().path = std::move(*path);
   return makeStatus(CMPI_RC_OK);
 }
 
@@ -108,17 +108,18 @@ CMPIStatus instSetFilter(const CMPIInstance* inst, const char** props, const cha
   auto* o = live(inst);
   if (o == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
   if (props == nullptr) {
-    o->data.filter.reset();
-    o->data.filterKeys.clear();
+    o->edit().filter.reset();
+    o->edit().filterKeys.clear();
     return makeStatus(CMPI_RC_OK);
   }
-  o->data.filter = nameList(props);
-  o->data.filterKeys = nameList(keys);
+  InstanceData& edit = o->edit();
+  edit.filter = nameList(props);
+  edit.filterKeys = nameList(keys);
   NamedData kept;
-  for (auto& entry : o->data.properties) {
-    if (o->data.admits(entry.first)) kept.push_back(std::move(entry));
+  for (auto& entry : edit.properties) {
+    if (edit.admits(entry.first)) kept.push_back(std::move(entry));
   }
-  o->data.properties = std::move(kept);
+  edit.properties = std::move(kept);
   return makeStatus(CMPI_RC_OK);
 }
 
@@ -129,7 +130,12 @@ const CMPIInstanceFT kInstanceFT = {CMPIVersion200, instRelease, instClone,   in
 }  // namespace
 
 EncInstance::EncInstance(const void* owner, InstanceData d)
-    : EncBase(owner, &kInstanceFT), data(std::move(d)) {}
+    : EncBase(owner, &kInstanceFT), data_(std::make_shared<InstanceData>(std::move(d))) {}
+
+InstanceData& EncInstance::edit() {
+  if (data_.use_count() > 1) data_ = std::make_shared<InstanceData>(*data_);
+  return *data_;
+}
 
 CMPIInstance* makeInstance(const void* owner, InstanceData data, bool detached) {
   return registry().adopt(std::make_unique<EncInstance>(owner, std::move(data)), detached)->cmpi();

@@ -85,10 +85,18 @@ class EncObjectPath : public EncBase<CMPIObjectPath, CMPIObjectPathFT, EncKind::
   PathData data;
 };
 
+// Shares its data copy-on-write with the results it was returned into, so that returning an
+// instance costs no copy and the MI may still change it afterwards.
 class EncInstance : public EncBase<CMPIInstance, CMPIInstanceFT, EncKind::Instance> {
  public:
   EncInstance(const void* owner, InstanceData data);
-  InstanceData data;
+  const InstanceData& data() const { return *data_; }
+  // The data to change, first unshared from every holder of a share().
+  InstanceData& edit();
+  std::shared_ptr<const InstanceData> share() const { return data_; }
+
+ private:
+  std::shared_ptr<InstanceData> data_;
 };
 
 class EncArgs : public EncBase<CMPIArgs, CMPIArgsFT, EncKind::Args> {
@@ -164,6 +172,8 @@ CMPIData datumToCmpi(const void* owner, const Datum& datum);
 std::optional<std::string> stringOf(const CMPIString* s);
 std::optional<PathData> pathOf(const CMPIObjectPath* op);
 std::optional<InstanceData> instanceOf(const CMPIInstance* inst);
+// The instance's data shared as it stands (copy-on-write); nullptr when the handle is not live.
+std::shared_ptr<const InstanceData> sharedInstanceOf(const CMPIInstance* inst);
 std::optional<NamedData> argsOf(const CMPIArgs* args);
 std::optional<NamedData> contextOf(const CMPIContext* ctx);
 

@@ -19,7 +19,12 @@ Result toResult(Outcome outcome) {
   for (auto& item : outcome.items) {
     if (item.isNull) continue;
     if (item.type == CMPI_instance) {
-      r.instances.push_back(*item.instance);
+      // Every instance the host stores is made non-const (Datum::embedded), so the sole
+      // holder may move it out instead of copying it.
+      if (item.instance.use_count() == 1)
+        r.instances.push_back(std::move(const_cast<InstanceData&>(*item.instance)));
+      else
+        r.instances.push_back(*item.instance);
     } else if (item.type == CMPI_ref) {
       r.paths.push_back(*item.path);
     }

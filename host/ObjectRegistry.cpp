@@ -7,6 +7,14 @@ namespace {
 
 thread_local Arena* tCurrentArena = nullptr;
 
+// The calling thread's last look-up, good while no object has been removed since.
+struct LastLookup {
+  const void* handle = nullptr;
+  EncObject* object = nullptr;
+  std::uint64_t removals = 0;
+};
+thread_local LastLookup tLast;
+
 // Arenas pushed by attachThread, with the arena each one displaced.
 struct AttachedArena {
   std::unique_ptr<Arena> arena;
@@ -37,9 +45,12 @@ void ObjectRegistry::add(std::unique_ptr<EncObject> object, bool detached) {
 
 EncObject* ObjectRegistry::lookup(const void* handle) {
   if (handle == nullptr) return nullptr;
+  if (handle == tLast.handle && tLast.removals == removals_.load(std::memory_order_acquire)) return tLast.object;
   std::lock_guard<std::mutex> lock(mu_);
   auto it = live_.find(handle);
-  return it == live_.end() ? nullptr : it->second.get();
+  if (it == live_.end()) return nullptr;
+  tLast = {handle, it->second.get(), removals_.load(std::memory_order_relaxed)};
+  return tLast.object;
 }
 
 bool ObjectRegistry::contains(const void* handle) { return lookup(handle) != nullptr; }
@@ -52,6 +63,7 @@ bool ObjectRegistry::release(const void* handle) {
     if (it == live_.end()) return false;
     doomed = std::move(it->second);
     live_.erase(it);
+    removals_.fetch_add(1, std::memory_order_release);
   }
   // Destroyed outside the lock: an object may own further registry objects.
   return true;
@@ -70,6 +82,7 @@ void ObjectRegistry::freeArena(Arena* arena) {
       }
     }
     arena->handles_.clear();
+    if (!doomed.empty()) removals_.fetch_add(1, std::memory_order_release);
   }
 }
 
@@ -85,6 +98,7 @@ void ObjectRegistry::freeOwner(const void* owner) {
         ++it;
       }
     }
+    if (!doomed.empty()) removals_.fetch_add(1, std::memory_order_release);
   }
 }
 

@@ -9,7 +9,9 @@
 #ifndef NRV_HOST_OBJECTREGISTRY_H
 #define NRV_HOST_OBJECTREGISTRY_H
 
+#include <atomic>
 #include <cstddef>
+#include <cstdint>
 #include <memory>
 #include <mutex>
 #include <unordered_map>
@@ -98,6 +100,9 @@ class ObjectRegistry {
   EncObject* lookup(const void* handle);
   void freeArena(Arena* arena);
 
+  // Bumped by every removal: a thread's last look-up stays good while it is unchanged, so
+  // that the many calls on one object (setting each property) need no lock.
+  std::atomic<std::uint64_t> removals_{0};
   std::mutex mu_;
   std::unordered_map<const void*, std::unique_ptr<EncObject>> live_;
 };

@@ -263,6 +263,11 @@ TEST_F(EncObjectsTest, ResultRefusesDeadObjects) {
   auto sink = std::make_shared<ResultSink>();
   CMPIResult* r = makeResult(mb, sink);
   CMPIInstance* ci = CMNewInstance(mb, path(), nullptr);
+  CMPIUint32 first = 1, second = 2;
+  CMSetProperty(ci, "Count", &first, CMPI_uint32);
+  EXPECT_EQ(CMReturnInstance(r, ci).rc, CMPI_RC_OK);
+  // What was returned stays as it was returned when the MI changes its instance afterwards.
+  CMSetProperty(ci, "Count", &second, CMPI_uint32);
   EXPECT_EQ(CMReturnInstance(r, ci).rc, CMPI_RC_OK);
   CMRelease(ci);
   EXPECT_EQ(CMReturnInstance(r, ci).rc, CMPI_RC_ERR_INVALID_PARAMETER);
@@ -270,9 +275,11 @@ TEST_F(EncObjectsTest, ResultRefusesDeadObjects) {
   CMPIUint32 v = 4;
   EXPECT_EQ(CMReturnData(r, &v, CMPI_uint32).rc, CMPI_RC_OK);
   EXPECT_EQ(CMReturnDone(r).rc, CMPI_RC_OK);
-  EXPECT_EQ(sink->items.size(), 2u);
+  ASSERT_EQ(sink->items.size(), 3u);
   EXPECT_TRUE(sink->done);
-  EXPECT_EQ(sink->items[1].scalar.uint32, 4u);
+  EXPECT_EQ(findNamed(sink->items[0].instance->properties, "Count")->scalar.uint32, 1u);
+  EXPECT_EQ(findNamed(sink->items[1].instance->properties, "Count")->scalar.uint32, 2u);
+  EXPECT_EQ(sink->items[2].scalar.uint32, 4u);
 }
 
 TEST_F(EncObjectsTest, EnumerationWalksUpcallAnswer) {
