@@ -1,6 +1,11 @@
 // Name tables of the meta-data, and the look-ups over classes and features.
 #include <cctype>
 #include <cstring>
+#include <strings.h>
+#include <memory>
+#include <mutex>
+#include <string_view>
+#include <unordered_map>
 
 #include "framework/Instance.h"
 
@@ -37,6 +42,44 @@ bool same_name(const char* candidate, const char* name) {
   return strcasecmp(candidate, name) == 0;
 }
 
+struct Case_Blind_Hash {
+  size_t operator()(std::string_view name) const {
+    size_t hash = 14695981039346656037ull;
+    for (unsigned char c : name) hash = (hash ^ static_cast<size_t>(std::tolower(c))) * 1099511628211ull;
+    return hash;
+  }
+};
+
+struct Case_Blind_Equal {
+  bool operator()(std::string_view a, std::string_view b) const {
+    return a.size() == b.size() && strncasecmp(a.data(), b.data(), a.size()) == 0;
+  }
+};
+
+// A repository's classes by name, built on its first look-up.  It records
+// the table it was built from, so a repository at a reused address (one a
+// test made on its stack) is indexed afresh.
+struct Class_Index {
+  const Meta_Class* const* built_from = nullptr;
+  size_t count = 0;
+  std::unordered_map<std::string_view, const Meta_Class*, Case_Blind_Hash, Case_Blind_Equal> by_name;
+};
+
+const Class_Index& class_index(const Meta_Repository* repository) {
+  static std::mutex mu;
+  static auto* indexes = new std::unordered_map<const Meta_Repository*, Class_Index>();  // lives to exit
+  std::lock_guard<std::mutex> lock(mu);
+  Class_Index& index = (*indexes)[repository];
+  if (index.built_from != repository->meta_classes || index.count != repository->num_meta_classes) {
+    index.by_name.clear();
+    for (size_t i = 0; i < repository->num_meta_classes; ++i)
+      index.by_name.emplace(repository->meta_classes[i]->name, repository->meta_classes[i]);  // the first wins
+    index.built_from = repository->meta_classes;
+    index.count = repository->num_meta_classes;
+  }
+  return index;
+}
+
 }  // namespace
 
 const Meta_Feature* find_feature(const Meta_Class* mc, const char* name, uint32_t kinds) {
@@ -68,11 +111,9 @@ bool is_subclass(const Meta_Class* ancestor, const Meta_Class* mc) {
 
 const Meta_Class* find_meta_class(const Meta_Repository* repository, const char* name) {
   if (repository == nullptr || name == nullptr || *name == '\0') return nullptr;
-  for (size_t i = 0; i < repository->num_meta_classes; ++i) {
-    const Meta_Class* mc = repository->meta_classes[i];
-    if (same_name(mc->name, name)) return mc;
-  }
-  return nullptr;
+  const Class_Index& index = class_index(repository);
+  auto it = index.by_name.find(std::string_view(name));
+  return it == index.by_name.end() ? nullptr : it->second;
 }
 
 }  // namespace cimple

@@ -6,6 +6,7 @@
 #include <strings.h>
 
 #include <algorithm>
+#include <cctype>
 #include <cstdlib>
 #include <cstring>
 #include <fstream>
@@ -13,6 +14,11 @@
 namespace nrv::host {
 
 namespace {
+
+std::string lowerCase(std::string text) {
+  std::transform(text.begin(), text.end(), text.begin(), [](unsigned char c) { return std::tolower(c); });
+  return text;
+}
 
 constexpr const char* kCreate = "_Create_";
 constexpr const char* kProviderSuffix = "_Provider";
@@ -111,7 +117,9 @@ std::variant<std::unique_ptr<ModuleLoader>, std::string> ModuleLoader::open(
 }
 
 ModuleLoader::ModuleLoader(std::string path, void* handle, std::vector<std::string> factories)
-    : path_(std::move(path)), handle_(handle), factories_(std::move(factories)) {}
+    : path_(std::move(path)), handle_(handle), factories_(std::move(factories)) {
+  for (const auto& exported : factories_) byLowerName_.emplace(lowerCase(exported), exported);
+}
 
 ModuleLoader::~ModuleLoader() { dlclose(handle_); }
 
@@ -128,9 +136,7 @@ std::optional<std::string> ModuleLoader::factoryFor(const std::string& className
   for (const std::string& candidate :
        {className + kProviderSuffix + tail, className + tail}) {
     // The exported spelling wins, so "nrvtavo_chip" finds "NRVTAVO_Chip_...".
-    for (const auto& exported : factories_) {
-      if (strcasecmp(exported.c_str(), candidate.c_str()) == 0) return exported;
-    }
+    if (auto it = byLowerName_.find(lowerCase(candidate)); it != byLowerName_.end()) return it->second;
     if (symbol(candidate) != nullptr) return candidate;
   }
   return std::nullopt;

@@ -12,6 +12,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <unordered_map>
 #include <variant>
 #include <vector>
 
@@ -63,6 +64,7 @@ class ModuleLoader {
   std::string path_;
   void* handle_;
   std::vector<std::string> factories_;
+  std::unordered_map<std::string, std::string> byLowerName_;  // lower-case -> exported spelling
 };
 
 // Exported function names of an ELF shared object (empty when it cannot be read).

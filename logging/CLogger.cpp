@@ -65,6 +65,12 @@ void CLogger::vlog(const char* file, const int* line, int level, const char* for
   for (NRV_LoggerInterface* sink : m_Sinks) sink->log(level, source, at, message.c_str());
 }
 
+bool CLogger::wants(int level) const {
+  std::lock_guard<std::mutex> lock(m_Mutex);
+  if (!isEnabled() && m_SysLogSink != nullptr) return m_SysLogSink->wants(level);
+  return std::any_of(m_Sinks.begin(), m_Sinks.end(), [level](const NRV_LoggerInterface* s) { return s->wants(level); });
+}
+
 int CLogger::registerSink(NRV_LoggerInterface* sink) {
   if (sink == nullptr) return 0;
   std::lock_guard<std::mutex> lock(m_Mutex);
@@ -146,6 +152,8 @@ std::string CLogger::tracePath() const {
 }
 
 }  // namespace cimple
+
+bool cimple::nrv_log_wanted(int level) { return CLogger::instance().wants(level); }
 
 void cimple::nrv_log(const char* file, const int* line, int level, const char* format, ...) {
   va_list args;

@@ -60,6 +60,8 @@ class CLogger {
   void log(const char* file, const int* line, int level, const char* format, ...)
       __attribute__((format(printf, 5, 6)));
   void vlog(const char* file, const int* line, int level, const char* format, va_list args);
+  // Whether a message of `level` would reach any sink now (see vlog).
+  bool wants(int level) const;
 
   // 1 when `sink` was appended, 0 when it was already registered (or null).
   // A registered NRV_SysLogger becomes the designated syslog sink.

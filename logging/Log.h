@@ -18,6 +18,10 @@ enum NRV_LogLevel : int {
 void nrv_log(const char* file, const int* line, int level, const char* format, ...)
     __attribute__((format(printf, 4, 5)));
 
+// Whether a message of `level` would be kept anywhere: NRV_LOG neither
+// evaluates its arguments nor formats a message nobody keeps.
+bool nrv_log_wanted(int level);
+
 constexpr const char* nrv_base_name(const char* path) {
   const char* base = path;
   for (const char* p = path; *p; ++p)
@@ -30,6 +34,7 @@ constexpr const char* nrv_base_name(const char* path) {
 #define NRV_LOG(level, ...)                                                  \
   do {                                                                       \
     static const int nrv_log_line_ = __LINE__;                               \
-    ::cimple::nrv_log(::cimple::nrv_base_name(__FILE__), &nrv_log_line_,    \
-                      (level), __VA_ARGS__);                                 \
+    if (::cimple::nrv_log_wanted(level))                                     \
+      ::cimple::nrv_log(::cimple::nrv_base_name(__FILE__), &nrv_log_line_,  \
+                        (level), __VA_ARGS__);                               \
   } while (0)

@@ -21,6 +21,10 @@ NRV_CIMLogger::NRV_CIMLogger(int32_t max_records)
 
 NRV_CIMLogger::~NRV_CIMLogger() { m_Logger.unregisterSink(this); }
 
+bool NRV_CIMLogger::wants(int level) const {
+  return level >= NRV_INVALID && level < NRV_INFO && nrv_mode_writes_records(m_Logger.getMode()) && m_MaxRecords != 0;
+}
+
 void NRV_CIMLogger::log(int level, const char* file, unsigned line, const char* message) {
   if (level < NRV_INVALID || level >= NRV_INFO || message == nullptr) return;
   if (!nrv_mode_writes_records(m_Logger.getMode()) || m_MaxRecords == 0) return;

@@ -41,6 +41,7 @@ class NRV_CIMLogger : public NRV_LoggerInterface {
   // ring is full the oldest slot is overwritten, so the vector is in slot
   // order, not time order.
   void log(int level, const char* file, unsigned line, const char* message) override;
+  bool wants(int level) const override;
   void start() override {}
   void stop() override {}
   // Empties the ring.

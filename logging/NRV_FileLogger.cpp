@@ -35,6 +35,10 @@ NRV_FileLogger::NRV_FileLogger() : NRV_FileLogger(CLogger::instance()) {}
 
 NRV_FileLogger::~NRV_FileLogger() { m_Logger.unregisterSink(this); }
 
+bool NRV_FileLogger::wants(int level) const {
+  return nrv_level_name(level) != nullptr && nrv_mode_writes_file(m_Logger.getMode());
+}
+
 void NRV_FileLogger::log(int level, const char* file, unsigned line, const char* message) {
   const char* level_name = nrv_level_name(level);
   if (level_name == nullptr || !nrv_mode_writes_file(m_Logger.getMode())) return;

@@ -24,6 +24,7 @@ class NRV_FileLogger : public NRV_LoggerInterface {
   ~NRV_FileLogger() override;
 
   void log(int level, const char* file, unsigned line, const char* message) override;
+  bool wants(int level) const override;
   // Reopens the stored path for appending when the mode writes the file.
   void start() override;
   // Closes the stream and forgets the path.

@@ -19,6 +19,12 @@ class NRV_LoggerInterface {
 
   // One formatted message from `file`:`line` at `level`; `message` may be null.
   virtual void log(int level, const char* file, unsigned line, const char* message) = 0;
+  // False when log() would drop every message of `level` as things stand; the
+  // logger then skips formatting it.  Called with the logger mutex held.
+  virtual bool wants(int level) const {
+    (void)level;
+    return true;
+  }
   // The logger's mode became non-zero.
   virtual void start() = 0;
   // The logger's mode became 0.

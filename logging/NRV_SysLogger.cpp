@@ -39,6 +39,8 @@ int NRV_SysLogger::priorityFor(int level) {
   return (level >= 0 && level < kNrvLevelCount) ? kPriorities[level] : -1;
 }
 
+bool NRV_SysLogger::wants(int level) const { return priorityFor(level) >= 0; }
+
 void NRV_SysLogger::log(int level, const char* file, unsigned line, const char* message) {
   const int priority = priorityFor(level);
   if (priority < 0 || message == nullptr) return;

@@ -22,6 +22,7 @@ class NRV_SysLogger : public NRV_LoggerInterface {
   ~NRV_SysLogger() override;
 
   void log(int level, const char* file, unsigned line, const char* message) override;
+  bool wants(int level) const override;
   void start() override {}
   void stop() override {}
   void clear() override {}
