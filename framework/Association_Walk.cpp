@@ -12,6 +12,15 @@ bool class_named_or_ancestor(const char* name, const Meta_Class* mc) {
 
 }  // namespace
 
+bool may_refer_to(const Meta_Class* association, const Meta_Class* source) {
+  bool may = false;
+  for_each_single_reference(association, [&](const Meta_Reference* mr) {
+    may = is_subclass(mr->meta_class, source);
+    return !may;
+  });
+  return may;
+}
+
 bool refers_to(const Instance* association, const Meta_Reference* mr, const Instance* source) {
   if (!is_subclass(mr->meta_class, source->meta_class)) return false;
   const Instance* target = reference_of(association, mr);

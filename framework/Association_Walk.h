@@ -31,6 +31,11 @@ void for_each_single_reference(const Meta_Class* mc, Visit&& visit) {
 // the source's class or an ancestor, and its target is key_eq to the source.
 bool refers_to(const Instance* association, const Meta_Reference* mr, const Instance* source);
 
+// False when no instance of `association` can refer to an object of class
+// `source` (no single reference declares the class or an ancestor of it):
+// a request from such an object has an empty answer.
+bool may_refer_to(const Meta_Class* association, const Meta_Class* source);
+
 // References: true when a single reference of `association` (named `role`,
 // when given) refers to `source`.
 bool references_source(const Instance* association, const Instance* source, const char* role);

@@ -1,5 +1,6 @@
 // The association MI functions of the CMPI adapter.  They answer with the
 // result objects only (no returnDone), as the association table requires.
+#include "framework/Association_Walk.h"
 #include "framework/CMPI_Adapter.h"
 #include "framework/CMPI_Delivery.h"
 #include "framework/Generic_Reads.h"
@@ -13,10 +14,15 @@ const CMPIStatus kNoAdapter{CMPI_RC_ERR_FAILED, nullptr};
 const char* given(const char* s) { return s ? s : ""; }
 
 // The source object of an association request as a key instance.  A source
-// class the module does not know yields no model and an empty answer.
+// class the module does not know, or that no reference of the provider's
+// association can point at, yields no model and an empty answer: a CIMOM
+// asks every association provider, and most have nothing to say.
 CMPIrc source_model(const CMPI_Call& call, const CMPIObjectPath* path, const std::string& ns, Instance_Ptr& model) {
   const Meta_Class* mc = call.adapter()->repository_class(path);
   if (mc == nullptr) return CMPI_RC_OK;
+  const Meta_Class* association = call.adapter()->meta_class();
+  if (association != nullptr && (association->flags & FLAG_ASSOCIATION) && !may_refer_to(association, mc))
+    return CMPI_RC_OK;
   Instance* instance = nullptr;
   CMPIrc rc = make_cimple_reference(CMPI_Env{call.broker(), call.adapter()->repository(), ns.c_str()}, mc, path,
                                     instance);

@@ -36,7 +36,9 @@ NRV_FileLogger::NRV_FileLogger() : NRV_FileLogger(CLogger::instance()) {}
 NRV_FileLogger::~NRV_FileLogger() { m_Logger.unregisterSink(this); }
 
 bool NRV_FileLogger::wants(int level) const {
-  return nrv_level_name(level) != nullptr && nrv_mode_writes_file(m_Logger.getMode());
+  if (nrv_level_name(level) == nullptr || !nrv_mode_writes_file(m_Logger.getMode())) return false;
+  std::lock_guard<std::mutex> lock(m_Mutex);
+  return m_File && (!m_bErrorsOnly || level == NRV_ERR || level == NRV_CRIT);
 }
 
 void NRV_FileLogger::log(int level, const char* file, unsigned line, const char* message) {
