@@ -30,7 +30,9 @@ T* refuse(CMPIStatus* rc, CMPIrc code) {
   return nullptr;
 }
 
+// Room for a typical instance's properties and keys, so that setting them moves none.
 constexpr size_t kTypicalPropertyCount = 24;
+constexpr size_t kTypicalKeyCount = 4;
 
 CMPIInstance* newInstance(const CMPIBroker* mb, const CMPIObjectPath* op, CMPIStatus* rc) {
   if (!validBroker(mb, rc)) return nullptr;
@@ -38,7 +40,6 @@ CMPIInstance* newInstance(const CMPIBroker* mb, const CMPIObjectPath* op, CMPISt
   if (!path) return refuse<CMPIInstance>(rc, CMPI_RC_ERR_INVALID_PARAMETER);
   InstanceData data;
   data.path = std::move(*path);
-  // Room for a typical instance's properties, so that setting them moves none.
   data.properties.reserve(kTypicalPropertyCount);
   setStatus(rc, CMPI_RC_OK);
   return makeInstance(mb, std::move(data));
@@ -51,6 +52,7 @@ CMPIObjectPath* newObjectPath(const CMPIBroker* mb, const char* ns, const char* 
   PathData data;
   data.nameSpace = ns == nullptr ? "" : ns;
   data.className = cn;
+  data.keys.reserve(kTypicalKeyCount);
   setStatus(rc, CMPI_RC_OK);
   return makeObjectPath(mb, std::move(data));
 }
@@ -155,7 +157,7 @@ std::string describe(EncObject& o) {
     case EncKind::Instance:
       return formatValue(Datum::embedded(static_cast<EncInstance&>(o).share()));
     case EncKind::Array: {
-      auto& a = static_cast<EncArray&>(o).data;
+      auto& a = static_cast<EncArray&>(o).data();
       return formatValue(Datum::arrayOf(a.elementType, a.elements));
     }
     default: return kindName(o.kind());

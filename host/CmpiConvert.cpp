@@ -58,9 +58,9 @@ CMPIrc datumFromCmpi(const CMPIValue* value, CMPIType type, Datum& out) {
     }
     auto* a = registry().find<EncArray>(value->array);
     if (a == nullptr) return CMPI_RC_ERR_INVALID_PARAMETER;
-    if (a->data.elementType != storedType(base)) return CMPI_RC_ERR_TYPE_MISMATCH;
+    if (a->data().elementType != storedType(base)) return CMPI_RC_ERR_TYPE_MISMATCH;
     if (!a->elementsLive()) return CMPI_RC_ERR_INVALID_HANDLE;
-    out = Datum::arrayOf(a->data.elementType, a->data.elements);
+    out = Datum::sharedArray(a->share());
     return CMPI_RC_OK;
   }
   if (isScalarType(base)) {
@@ -72,7 +72,7 @@ CMPIrc datumFromCmpi(const CMPIValue* value, CMPIType type, Datum& out) {
   switch (base) {
     case CMPI_chars:
       // As CIMOMs read it (and provider code writes it): the value pointer is the C string.
-      out = Datum::string(reinterpret_cast<const char*>(value));
+      out.setText(reinterpret_cast<const char*>(value));
       return CMPI_RC_OK;
     case CMPI_string: {
       if (value->string == nullptr) {

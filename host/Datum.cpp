@@ -233,6 +233,23 @@ Datum Datum::arrayOf(CMPIType elementType, std::vector<Datum> elements) {
   return d;
 }
 
+Datum Datum::sharedArray(std::shared_ptr<const ArrayData> value) {
+  Datum d;
+  d.type = static_cast<CMPIType>(value->elementType | CMPI_ARRAY);
+  d.isNull = false;
+  d.array = std::move(value);
+  return d;
+}
+
+void Datum::setText(const char* value) {
+  type = CMPI_string;
+  isNull = false;
+  text.assign(value);
+  path.reset();
+  instance.reset();
+  array.reset();
+}
+
 CMPISint64 Datum::asInteger() const {
   switch (type) {
     case CMPI_boolean: return scalar.boolean;

@@ -57,6 +57,11 @@ struct Datum {
   static Datum embedded(std::shared_ptr<const InstanceData> value);
   static Datum time(DateTimeValue value);
   static Datum arrayOf(CMPIType elementType, std::vector<Datum> elements);
+  // Shares the array; it must not change while the Datum holds it.
+  static Datum sharedArray(std::shared_ptr<const ArrayData> value);
+
+  // Makes this a string in place (no Datum made and moved, as string() does).
+  void setText(const char* value);
 
   bool isArray() const { return (type & CMPI_ARRAY) != 0; }
   // Integer view of any integer type (for tests and printing).

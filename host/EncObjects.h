@@ -75,8 +75,15 @@ class EncArray : public EncBase<CMPIArray, CMPIArrayFT, EncKind::Array> {
   // array where SFCB would crash.
   bool elementsLive() const;
 
-  ArrayData data;
+  // As EncInstance: shared copy-on-write with the values it was set into.
+  const ArrayData& data() const { return *data_; }
+  ArrayData& edit();
+  std::shared_ptr<const ArrayData> share() const { return data_; }
+
   std::vector<const void*> setHandles;  // per element: the object set into it, if any
+
+ private:
+  std::shared_ptr<ArrayData> data_;
 };
 
 class EncObjectPath : public EncBase<CMPIObjectPath, CMPIObjectPathFT, EncKind::ObjectPath> {

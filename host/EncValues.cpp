@@ -87,19 +87,19 @@ CMPIArray* arrayClone(const CMPIArray* a, CMPIStatus* rc) {
     return nullptr;
   }
   setStatus(rc, CMPI_RC_OK);
-  return makeArray(o->owner(), o->data, true);
+  return makeArray(o->owner(), o->data(), true);
 }
 
 CMPICount arraySize(const CMPIArray* a, CMPIStatus* rc) {
   auto* o = registry().find<EncArray>(a);
   setStatus(rc, o == nullptr ? CMPI_RC_ERR_INVALID_HANDLE : CMPI_RC_OK);
-  return o == nullptr ? 0 : static_cast<CMPICount>(o->data.elements.size());
+  return o == nullptr ? 0 : static_cast<CMPICount>(o->data().elements.size());
 }
 
 CMPIType arrayType(const CMPIArray* a, CMPIStatus* rc) {
   auto* o = registry().find<EncArray>(a);
   setStatus(rc, o == nullptr ? CMPI_RC_ERR_INVALID_HANDLE : CMPI_RC_OK);
-  return o == nullptr ? CMPIType(CMPI_null) : o->data.elementType;
+  return o == nullptr ? CMPIType(CMPI_null) : o->data().elementType;
 }
 
 CMPIData arrayGet(const CMPIArray* a, CMPICount index, CMPIStatus* rc) {
@@ -108,7 +108,7 @@ CMPIData arrayGet(const CMPIArray* a, CMPICount index, CMPIStatus* rc) {
     setStatus(rc, CMPI_RC_ERR_INVALID_HANDLE);
     return badData();
   }
-  if (index >= o->data.elements.size()) {
+  if (index >= o->data().elements.size()) {
     setStatus(rc, CMPI_RC_ERR_NO_SUCH_PROPERTY);
     return badData();
   }
@@ -117,22 +117,22 @@ CMPIData arrayGet(const CMPIArray* a, CMPICount index, CMPIStatus* rc) {
     return badData();
   }
   setStatus(rc, CMPI_RC_OK);
-  return datumToCmpi(o->owner(), o->data.elements[index]);
+  return datumToCmpi(o->owner(), o->data().elements[index]);
 }
 
 CMPIStatus arraySet(const CMPIArray* a, CMPICount index, const CMPIValue* value, CMPIType type) {
   auto* o = registry().find<EncArray>(a);
   if (o == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
-  if (index >= o->data.elements.size()) return makeStatus(CMPI_RC_ERR_NO_SUCH_PROPERTY);
+  if (index >= o->data().elements.size()) return makeStatus(CMPI_RC_ERR_NO_SUCH_PROPERTY);
   const CMPIType stored = type == CMPI_chars ? CMPIType(CMPI_string) : type;
-  if ((type & CMPI_ARRAY) != 0 || stored != o->data.elementType) {
+  if ((type & CMPI_ARRAY) != 0 || stored != o->data().elementType) {
     return makeStatus(CMPI_RC_ERR_TYPE_MISMATCH);
   }
   Datum d;
   const CMPIrc rc = datumFromCmpi(value, type, d);
   if (rc != CMPI_RC_OK) return makeStatus(rc);
-  o->data.elements[index] = std::move(d);
-  o->setHandles.resize(o->data.elements.size());
+  o->edit().elements[index] = std::move(d);
+  o->setHandles.resize(o->data().elements.size());
   const bool object = (type & CMPI_ENC) != 0 && type != CMPI_chars && value != nullptr;
   o->setHandles[index] = object ? value->inst : nullptr;
   return makeStatus(CMPI_RC_OK);
@@ -204,7 +204,12 @@ EncDateTime::EncDateTime(const void* owner, DateTimeValue v)
     : EncBase(owner, &kDateTimeFT), value(v) {}
 
 EncArray::EncArray(const void* owner, ArrayData d)
-    : EncBase(owner, &kArrayFT), data(std::move(d)) {}
+    : EncBase(owner, &kArrayFT), data_(std::make_shared<ArrayData>(std::move(d))) {}
+
+ArrayData& EncArray::edit() {
+  if (data_.use_count() > 1) data_ = std::make_shared<ArrayData>(*data_);
+  return *data_;
+}
 
 bool EncArray::elementsLive() const {
   for (const void* handle : setHandles) {

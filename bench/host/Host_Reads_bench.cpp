@@ -9,6 +9,7 @@
 // CIMOM up-calls).  A read whose cost per call grows with the site shows as
 // a rising time from x1 to x100.  The retained heap and the peak resident
 // size that the catalogue adds are reported per catalogue instance.
+// NRV_BENCH_MIN_TIME (seconds) lengthens each timed read, for profiling.
 #include <benchmark/benchmark.h>
 #include <malloc.h>
 #include <stdlib.h>
@@ -171,6 +172,12 @@ void BM_Memory(benchmark::State& state) {
   state.counters["peak_rss_bytes_per_instance"] = scene.peak_rss_per_instance;
 }
 
+double read_min_time() {
+  const char* seconds = getenv("NRV_BENCH_MIN_TIME");
+  const double chosen = seconds != nullptr ? atof(seconds) : 0.0;
+  return chosen > 0.0 ? chosen : 0.2;
+}
+
 bool run(const std::string& scale) {
   char root[] = "/tmp/nrv_host_bench_XXXXXX";
   if (mkdtemp(root) == nullptr) return false;
@@ -195,7 +202,7 @@ bool run(const std::string& scale) {
   for (bool generic : {false, true}) {
     const std::string mode = generic ? "/generic" : "/indexed";
     // The generic reads of the largest site take a second or more each.
-    const double min_time = generic && large ? 0.0 : (getenv("NRV_BENCH_MIN_TIME") ? atof(getenv("NRV_BENCH_MIN_TIME")) : 0.2);
+    const double min_time = generic && large ? 0.0 : read_min_time();
     auto limit = [&](benchmark::internal::Benchmark* b) {
       if (min_time == 0.0)
         b->Iterations(2);
