@@ -18,10 +18,24 @@ bool NRV_Catalogue::insert(Instance* instance) {
   return false;
 }
 
+const String& moduleNameSpace() {
+  static const String name_space(kNrvNamespace);
+  return name_space;
+}
+
 Instance* makeInstance(const Meta_Class& mc) {
   Instance* instance = create(&mc, true);
-  instance->__name_space = kNrvNamespace;
+  instance->__name_space = moduleNameSpace();
   return instance;
+}
+
+Instance* makeEnd(const Instance* end) {
+  if (end == nullptr) return nullptr;
+  Instance* copy = create(end->meta_class, false);
+  set_null_flags(copy, true, true, 1);
+  cimple::copy(copy, end, true);
+  copy->__name_space = end->__name_space.empty() ? moduleNameSpace() : end->__name_space;
+  return copy;
 }
 
 Instance* makeAssociation(const Meta_Class& mc, const Instance* first, const Instance* second) {
@@ -34,8 +48,8 @@ Instance* makeAssociation(const Meta_Class& mc, const Instance* first, const Ins
   }
   if (found < 2) return nullptr;
   Instance* association = makeInstance(mc);
-  reference_slot(association, ends[0]) = clone(first);
-  reference_slot(association, ends[1]) = clone(second);
+  reference_slot(association, ends[0]) = makeEnd(first);
+  reference_slot(association, ends[1]) = makeEnd(second);
   return association;
 }
 

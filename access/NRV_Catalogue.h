@@ -51,9 +51,18 @@ C* makeInstance() {
   return static_cast<C*>(makeInstance(C::static_meta_class));
 }
 
+// The module's namespace as one shared string, for instances to share.
+const String& moduleNameSpace();
+
+// What an association keeps of an end: a new instance with the end's keys
+// only (clients see references as object paths), in the end's namespace, or
+// in the module's when the end names none: an end says where it lives, so
+// that a request from another namespace (a profile's) gets its true path.
+Instance* makeEnd(const Instance* end);
+
 // A new association of class `mc` whose first and second references (in the
-// order the class declares them) hold copies of `first` and `second`.  Null
-// when either end is missing or the class has fewer than two references.
+// order the class declares them) hold ends (makeEnd) of `first` and `second`.
+// Null when either end is missing or the class has fewer than two references.
 Instance* makeAssociation(const Meta_Class& mc, const Instance* first, const Instance* second);
 
 template <class A>

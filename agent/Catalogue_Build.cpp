@@ -2,6 +2,8 @@
 
 #include <cstdarg>
 
+#include "access/NRV_Catalogue.h"
+
 namespace cimple {
 
 Catalogue_Build::Catalogue_Build(ProviderAgent& a) : agent(a) {}
@@ -14,13 +16,8 @@ Instance* Catalogue_Build::endpoint(const Instance* end) {
   if (end == nullptr) return nullptr;
   auto [it, fresh] = endpoints_.try_emplace(end, nullptr);
   if (fresh) {
-    // Clients see references as object paths, so the keys are all a copy
-    // needs; sharing one copy keeps a large catalogue's associations small.
-    Instance* copy = create(end->meta_class, false);
-    set_null_flags(copy, true, true, 1);
-    cimple::copy(copy, end, true);
-    copy->__name_space = end->__name_space;
-    it->second = copy;
+    // Sharing one key copy per end keeps a large catalogue's associations small.
+    it->second = makeEnd(end);
   }
   return it->second;
 }

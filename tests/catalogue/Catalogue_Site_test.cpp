@@ -204,6 +204,35 @@ TEST_F(CatalogueSite, TheModulesOwnHostAndChassisCarryEveryCard) {
   EXPECT_EQ(host().associatorNames(chassis, cards).paths.size(), 2u);
 }
 
+// Asked from the interop namespace, a profile's conforming elements are
+// named, fetched and referred to where they live: in the module's namespace.
+TEST_F(CatalogueSite, FromAProfileTheWalkReachesTheCardsInTheModulesNamespace) {
+  const PathData profile{"root/pg_interop", "", "NRVTAVO_RegisteredProfile",
+                         {{"InstanceID", Datum::string("NRV:Physical Asset")}}};
+  Result names = host().associatorNames(profile);
+  ASSERT_TRUE(names.ok()) << names.errorText();
+  size_t cards = 0;
+  for (const PathData& end : names.paths) {
+    EXPECT_EQ(end.nameSpace, kNs) << formatPath(end);
+    cards += end.className == "NRVTAVO_Card";
+  }
+  EXPECT_EQ(cards, 2u);
+  Result whole = host().associators(profile);
+  ASSERT_TRUE(whole.ok()) << whole.errorText();
+  cards = 0;
+  for (const HostInstance& end : whole.instances) {
+    if (end.path.className != "NRVTAVO_Card") continue;
+    ++cards;
+    EXPECT_EQ(end.path.nameSpace, kNs);
+    EXPECT_NE(findNamed(end.properties, "SerialNumber"), nullptr);
+  }
+  EXPECT_EQ(cards, 2u);
+  Result links = host().references(profile);
+  ASSERT_FALSE(links.instances.empty()) << links.errorText();
+  for (const HostInstance& link : links.instances)
+    EXPECT_EQ(ref(findNamed(link.properties, "ManagedElement")).nameSpace, kNs) << formatPath(link.path);
+}
+
 TEST_F(CatalogueSite, FromACardTheWalkReachesChipPackageConnectorsAndPorts) {
   PathData card;
   for (const HostInstance& c : all("NRVTAVO_Card"))

@@ -89,8 +89,10 @@ TEST_F(FeatureTest, TwoCardsWithOneFruUuidAreBothKeptEachWithItsOwnFruLink) {
   ASSERT_EQ(links.size(), 2u);
   for (size_t i = 0; i < links.size(); ++i) {
     const auto* link = static_cast<const NRVTAVO_FRUElementVPD*>(links[i]);
-    EXPECT_EQ(textOf(link->ManagedElement->NRVSerialNumber), textOf(link->SettingData->InstanceID));
-    EXPECT_NE(catalogue().of<NRVTAVO_Card>().lookup(link->ManagedElement), nullptr);
+    // An association keeps its ends' keys only: the card is the map's.
+    const auto* card = static_cast<const NRVTAVO_Card*>(catalogue().of<NRVTAVO_Card>().lookup(link->ManagedElement));
+    ASSERT_NE(card, nullptr);
+    EXPECT_EQ(textOf(card->NRVSerialNumber), textOf(link->SettingData->InstanceID));
   }
 }
 
