@@ -137,7 +137,12 @@ TEST_F(LoggerTest, DisabledLoggingReachesOnlyTheSyslogSink) {
     EXPECT_EQ(4u, logger.sinkCount());
     log(NRV_DBG, "only syslog hears this");
     EXPECT_EQ(1u, capture.entries().size());
+    // What no sink keeps is not even formatted; what syslog keeps is.
+    EXPECT_FALSE(logger.wants(NRV_DBG));
+    EXPECT_FALSE(logger.wants(NRV_INFO));
+    EXPECT_TRUE(logger.wants(NRV_ERR));
     logger.enable();
+    EXPECT_TRUE(logger.wants(NRV_DBG));  // the capturing sink keeps everything
     log(NRV_DBG, "enabled: everyone");
     EXPECT_EQ(2u, capture.entries().size());
     logger.disable();
@@ -191,6 +196,20 @@ TEST_F(LoggerTest, LogModeSelectsFileAndRecordSinks) {
     EXPECT_EQ(c.file, !read_text(trace).empty());
     EXPECT_EQ(c.record, records.records().size() == 1u);
   }
+}
+
+TEST_F(LoggerTest, SinksWantOnlyWhatTheyWouldWrite) {
+  logger.unregisterSink(&capture);
+  logger.setMode(0);
+  for (int level : {NRV_CRIT, NRV_ERR, NRV_DBG}) EXPECT_FALSE(logger.wants(level)) << level;
+  ASSERT_EQ(0, logger.setTracePath(trace));
+  logger.setMode(NRV_MODE_FILE);
+  EXPECT_TRUE(logger.wants(NRV_DBG));
+  EXPECT_FALSE(logger.wants(6));
+  logger.setErrorsOnly();
+  ASSERT_EQ(0, logger.setTracePath(trace));
+  EXPECT_FALSE(logger.wants(NRV_DBG));
+  EXPECT_TRUE(logger.wants(NRV_ERR));
 }
 
 TEST_F(LoggerTest, FileTakesEveryDefinedLevelButNoOther) {
