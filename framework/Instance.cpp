@@ -137,6 +137,23 @@ Instance* create(const Meta_Method* mm) {
   return allocate(reinterpret_cast<const Meta_Class*>(mm));
 }
 
+void prefetch_instance(const Instance* instance, size_t bytes) {
+  if (instance == nullptr) return;
+  const char* start = reinterpret_cast<const char*>(instance);
+  for (size_t at = 0; at < bytes; at += 64) __builtin_prefetch(start + at);
+}
+
+void prefetch_strings(const Instance* instance) {
+  if (instance == nullptr) return;
+  const Meta_Class* mc = instance->meta_class;
+  for (size_t i = 0; i < mc->num_meta_features; ++i) {
+    const Meta_Feature* mf = mc->meta_features[i];
+    if (!(mf->flags & FLAG_PROPERTY)) continue;
+    auto* mp = reinterpret_cast<const Meta_Property*>(mf);
+    if (mp->type == STRING && !is_array(mp)) static_cast<const String*>(slot(instance, mp->offset))->prefetch();
+  }
+}
+
 Instance* clone(const Instance* source) {
   const Meta_Class* mc = source->meta_class;
   void* mem = std::malloc(mc->size);

@@ -74,6 +74,12 @@ Instance* create(const Meta_Class* mc, bool with_defaults = false);
 Instance* create(const Meta_Method* mm);
 // A deep copy with reference count 1; referenced instances are cloned too.
 Instance* clone(const Instance* instance);
+// Start loading an instance's own memory, or the text of its scalar strings,
+// into the cache: a loop over a large catalogue, whose instances lie far
+// apart, asks for those a few steps ahead of the one it works on.
+// `bytes` is how much of the instance to load (its class's size, say).
+void prefetch_instance(const Instance* instance, size_t bytes);
+void prefetch_strings(const Instance* instance);
 void ref(const Instance* instance);
 void unref(Instance* instance);  // accepts null
 // Releases one reference and destroys at zero; the usual way to drop an
