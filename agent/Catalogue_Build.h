@@ -67,8 +67,9 @@ struct Catalogue_Build {
   std::unordered_map<std::string, Chip_Entry> chips;                  // by chip tag
   std::unordered_map<std::string, Physical_Port_Entry> physical_ports;  // by "serial:port"
 
-  // A key-only copy of `end` (keys and name space), made once per instance
-  // and shared by every association that refers to it.  Null for null.
+  // A key-only copy of `end` (makeEnd: its keys, in the namespace it lives
+  // in), made once per instance and shared by every association that refers
+  // to it.  Null for null.
   Instance* endpoint(const Instance* end);
 
  private:

@@ -172,10 +172,12 @@ ask ei-wrong-namespace ei "root/pg_interop:NRVTAVO_ProviderConfigSetting"
 ask ei-unknown-namespace ei "root/bogus:NRVTAVO_ProviderConfigSetting"
 ask mi-unknown-namespace mi "root/bogus:${timeout_setting#root/norvane:}" current=25
 ask ein-unknown-class ein root/norvane:NRVTAVO_NoSuchClass
-# Associations from the setting, the first software identity and the first card the module has.
+# Associations from the setting, the first software identity and the first card the module has,
+# and from a profile in the interop namespace to the elements that conform to it in the module's.
 first_path() { nrv_cim ein "root/norvane:$1" 2>/dev/null | head -n 1 || true; }
 sources=("setting=$timeout_setting" "identity=$(first_path NRVTAVO_SoftwareIdentity)"
-         "card=$(first_path NRVTAVO_Card)")
+         "card=$(first_path NRVTAVO_Card)"
+         'profile=root/pg_interop:NRVTAVO_RegisteredProfile.InstanceID="NRV:Physical Asset"')
 for entry in "${sources[@]}"; do
   tag=${entry%%=*} source=${entry#*=}
   [ -n "$source" ] || { say "no $tag to start associations from"; exit 1; }
