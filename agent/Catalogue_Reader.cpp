@@ -23,14 +23,29 @@ namespace {
 // ones: far enough to hide a memory access, near enough to stay in the cache.
 constexpr size_t kPrefetchAhead = 4;
 
-// Clones the map into `snapshot`; the caller holds m_DataMutex.  False
-// (snapshot emptied) when two instances have equal keys.
-bool copy_map(Instance_Map& map, Instance_Map& snapshot) {
+// A class of the SAN catalogue is built aside and published whole (its map
+// swapped in), never changed in place once published: its snapshot may hold
+// the map's own instances, each copied for its handler only as it is
+// delivered, outside the locks, where the copy's reads also bring into the
+// cache what the delivery reads next.  Every other class is copied under
+// the locks.
+bool published_whole(const Catalogue_Source& from) {
+  return from.catalogue == Catalogue::SAN && from.refresh == nullptr;
+}
+
+// Copies the map into `snapshot` (clones, or the instances themselves when
+// `share`); the caller holds m_DataMutex.  False (snapshot emptied) when two
+// instances have equal keys.
+bool copy_map(Instance_Map& map, Instance_Map& snapshot, bool share) {
   const size_t bytes = map.meta_class()->size;
   for (size_t i = 0; i < map.size(); ++i) {
     if (i + 2 * kPrefetchAhead < map.size()) prefetch_instance(map[i + 2 * kPrefetchAhead], bytes);
     if (i + kPrefetchAhead < map.size()) prefetch_strings(map[i + kPrefetchAhead]);
-    Instance* copy = clone(map[i]);
+    Instance* copy = map[i];
+    if (share)
+      ref(copy);
+    else
+      copy = clone(copy);
     if (snapshot.insert(copy) < 0) {
       destroy(copy);  // a refused instance stays ours
       NRV_LOG_AS_AGENT(NRV_CRIT, "Insert failed for %zu", i);
@@ -88,19 +103,21 @@ bool read_map(const Catalogue_Source& from, Work&& work) {
   }
 }
 
-// Hands each instance to the handler, which owns it from then on; the
-// handler's answer to go on or stop is honoured only when `may_stop`.  A
-// handler that throws ends the delivery as a failed read.
+// Hands each instance (a copy of it when `copy_each`: the instances are
+// shared) to the handler, which owns it from then on; the handler's answer to
+// go on or stop is honoured only when `may_stop`.  A handler that throws ends
+// the delivery as a failed read.
 void deliver(const Catalogue_Source& from, std::vector<Instance*>& instances, const Handler& handler,
-             bool may_stop) {
+             bool may_stop, bool copy_each = false) {
   size_t i = 0;
   try {
     while (i < instances.size()) {
       if (i + 2 * kPrefetchAhead < instances.size())
         prefetch_instance(instances[i + 2 * kPrefetchAhead], instances[i]->meta_class->size);
       if (i + kPrefetchAhead < instances.size()) prefetch_strings(instances[i + kPrefetchAhead]);
-      Instance* instance = instances[i];
+      Instance_Ptr taken(instances[i]);
       instances[i++] = nullptr;
+      Instance* instance = copy_each ? clone(taken.get()) : taken.release();
       if (!handler(instance, 0) && may_stop) break;
     }
   } catch (...) {
@@ -120,7 +137,7 @@ int enumerate(const Catalogue_Source& from, const Handler& handler) {
   read_map(from, [&](Instance_Map& map) {
     // The snapshot only checks the keys and is handed out: no reference index.
     Instance_Map snapshot(map.meta_class(), false);
-    if (!copy_map(map, snapshot)) return;
+    if (!copy_map(map, snapshot, published_whole(from))) return;
     // The snapshot's clones are private: they are handed out as they are,
     // after the locks are released, rather than cloned a second time.
     taken.reserve(snapshot.size());
@@ -130,7 +147,7 @@ int enumerate(const Catalogue_Source& from, const Handler& handler) {
     }
   });
   // The handler's answer is not consulted: every instance is delivered.
-  deliver(from, taken, handler, false);
+  deliver(from, taken, handler, false, published_whole(from));
   NRV_LOG(NRV_DBG, "%s_Provider::enum_instances()", from.class_name);
   return ENUM_INSTANCES_OK;
 }

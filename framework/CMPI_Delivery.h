@@ -16,11 +16,6 @@
 
 namespace cimple {
 
-struct Instance_Unref {
-  void operator()(Instance* instance) const { unref(instance); }
-};
-using Instance_Ptr = std::unique_ptr<Instance, Instance_Unref>;
-
 struct CMPI_Delivery {
   const CMPIBroker* broker;
   const CMPIContext* context;

@@ -11,6 +11,7 @@
 
 #include <atomic>
 #include <cstdint>
+#include <memory>
 #include <string>
 
 #include "framework/Array.h"
@@ -85,6 +86,12 @@ void unref(Instance* instance);  // accepts null
 // Releases one reference and destroys at zero; the usual way to drop an
 // instance you own.
 inline void destroy(Instance* instance) { unref(instance); }
+
+// Holds one reference to an instance.
+struct Instance_Unref {
+  void operator()(Instance* instance) const { unref(instance); }
+};
+using Instance_Ptr = std::unique_ptr<Instance, Instance_Unref>;
 
 // --- comparison and editing ---------------------------------------------------
 
