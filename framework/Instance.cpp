@@ -6,6 +6,7 @@
 // copy of it; every other property is null.  Without, nothing is null.
 #include "framework/Instance.h"
 
+#include <cstddef>
 #include <cstdlib>
 #include <cstring>
 #include <new>
@@ -158,7 +159,12 @@ Instance* clone(const Instance* source) {
   const Meta_Class* mc = source->meta_class;
   void* mem = std::malloc(mc->size);
   if (mem == nullptr) throw std::bad_alloc();
-  std::memcpy(mem, static_cast<const void*>(source), mc->size);
+  // Everything but the reference count, which other threads may be changing
+  // (an instance may be shared while it is cloned): the copy starts at one.
+  constexpr size_t kAfterRefs = offsetof(Instance, refs) + sizeof(Instance::refs);
+  std::memcpy(mem, static_cast<const void*>(source), offsetof(Instance, refs));
+  std::memcpy(static_cast<char*>(mem) + kAfterRefs, reinterpret_cast<const char*>(source) + kAfterRefs,
+              mc->size - kAfterRefs);
   Instance* copy = static_cast<Instance*>(mem);
   copy->refs = 1;
   new (&copy->__name_space) String(source->__name_space);
