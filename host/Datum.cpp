@@ -4,6 +4,7 @@
 #include <strings.h>
 #include <sys/time.h>
 
+#include <cctype>
 #include <cstdio>
 #include <cstring>
 
@@ -292,7 +293,10 @@ bool Datum::operator==(const Datum& o) const {
 }
 
 bool sameName(const std::string& a, const std::string& b) {
-  return a.size() == b.size() && strcasecmp(a.c_str(), b.c_str()) == 0;
+  // Most names that differ differ in length or in their first letter.
+  return a.size() == b.size() && (a.empty() || std::tolower(static_cast<unsigned char>(a[0])) ==
+                                                   std::tolower(static_cast<unsigned char>(b[0]))) &&
+         strcasecmp(a.c_str(), b.c_str()) == 0;
 }
 
 const Datum* findNamed(const NamedData& list, const std::string& name) {
