@@ -23,6 +23,16 @@ namespace {
 // ones: far enough to hide a memory access, near enough to stay in the cache.
 constexpr size_t kPrefetchAhead = 4;
 
+// Before a loop works on `instances[i]` (a map or a vector of `count`
+// instances of at least `bytes` each): the instance two steps ahead starts
+// loading, and the strings of the one a step ahead, whose memory is by then
+// in the cache.
+template <class Instances>
+void load_ahead(const Instances& instances, size_t count, size_t i, size_t bytes) {
+  if (i + 2 * kPrefetchAhead < count) prefetch_instance(instances[i + 2 * kPrefetchAhead], bytes);
+  if (i + kPrefetchAhead < count) prefetch_strings(instances[i + kPrefetchAhead]);
+}
+
 // A class of the SAN catalogue is built aside and published whole (its map
 // swapped in), never changed in place once published: its snapshot may hold
 // the map's own instances, each copied for its handler only as it is
@@ -39,8 +49,7 @@ bool published_whole(const Catalogue_Source& from) {
 bool copy_map(Instance_Map& map, Instance_Map& snapshot, bool share) {
   const size_t bytes = map.meta_class()->size;
   for (size_t i = 0; i < map.size(); ++i) {
-    if (i + 2 * kPrefetchAhead < map.size()) prefetch_instance(map[i + 2 * kPrefetchAhead], bytes);
-    if (i + kPrefetchAhead < map.size()) prefetch_strings(map[i + kPrefetchAhead]);
+    load_ahead(map, map.size(), i, bytes);
     Instance* copy = map[i];
     if (share)
       ref(copy);
@@ -112,9 +121,7 @@ void deliver(const Catalogue_Source& from, std::vector<Instance*>& instances, co
   size_t i = 0;
   try {
     while (i < instances.size()) {
-      if (i + 2 * kPrefetchAhead < instances.size())
-        prefetch_instance(instances[i + 2 * kPrefetchAhead], instances[i]->meta_class->size);
-      if (i + kPrefetchAhead < instances.size()) prefetch_strings(instances[i + kPrefetchAhead]);
+      load_ahead(instances, instances.size(), i, instances[i]->meta_class->size);
       Instance_Ptr taken(instances[i]);
       instances[i++] = nullptr;
       Instance* instance = copy_each ? clone(taken.get()) : taken.release();
@@ -134,12 +141,14 @@ void release(std::vector<Instance*>& instances) {
 
 int enumerate(const Catalogue_Source& from, const Handler& handler) {
   std::vector<Instance*> taken;
+  const bool shared = published_whole(from);
   read_map(from, [&](Instance_Map& map) {
     // The snapshot only checks the keys and is handed out: no reference index.
     Instance_Map snapshot(map.meta_class(), false);
-    if (!copy_map(map, snapshot, published_whole(from))) return;
-    // The snapshot's clones are private: they are handed out as they are,
-    // after the locks are released, rather than cloned a second time.
+    if (!copy_map(map, snapshot, shared)) return;
+    // Clones are private and handed out as they are, after the locks are
+    // released, rather than cloned a second time; shared instances are
+    // copied one by one as they are delivered.
     taken.reserve(snapshot.size());
     for (size_t i = 0; i < snapshot.size(); ++i) {
       ref(snapshot[i]);
@@ -147,7 +156,7 @@ int enumerate(const Catalogue_Source& from, const Handler& handler) {
     }
   });
   // The handler's answer is not consulted: every instance is delivered.
-  deliver(from, taken, handler, false, published_whole(from));
+  deliver(from, taken, handler, false, shared);
   NRV_LOG(NRV_DBG, "%s_Provider::enum_instances()", from.class_name);
   return ENUM_INSTANCES_OK;
 }

@@ -5,7 +5,6 @@
 #include <unistd.h>
 
 #include <algorithm>
-#include <cctype>
 #include <condition_variable>
 #include <memory>
 #include <set>
@@ -28,12 +27,6 @@ struct BrokerList {
 BrokerList& brokers() {
   static BrokerList* list = new BrokerList();
   return *list;
-}
-
-std::string lower(std::string s) {
-  std::transform(s.begin(), s.end(), s.begin(),
-                 [](unsigned char c) { return static_cast<char>(std::tolower(c)); });
-  return s;
 }
 
 // The platform classes the host serves itself, and their CIM ancestry.
@@ -379,7 +372,7 @@ Broker::Broker(Router& router) : router_(router) {
   broker_->eft = &kBrokerEncFT;
   broker_->xft = &kBrokerExtFT;
   broker_->mft = &kBrokerMemFT;
-  for (const auto& p : kDefaultParents) parents_[lower(p[0])] = p[1];
+  for (const auto& p : kDefaultParents) parents_[lowerName(p[0])] = p[1];
   list.live.insert(this);
 }
 
@@ -427,19 +420,19 @@ BrokerRef::~BrokerRef() {
 
 void Broker::addClassParent(const std::string& child, const std::string& parent) {
   std::lock_guard<std::mutex> lock(mu_);
-  parents_[lower(child)] = parent;
+  parents_[lowerName(child)] = parent;
 }
 
 bool Broker::classIsA(const std::string& className, const std::string& ancestor) const {
   std::lock_guard<std::mutex> lock(mu_);
-  std::string current = lower(className);
-  const std::string wanted = lower(ancestor);
+  std::string current = lowerName(className);
+  const std::string wanted = lowerName(ancestor);
   // Bounded walk: a cyclic table must not hang the broker.
   for (size_t depth = 0; depth <= parents_.size(); ++depth) {
     if (current == wanted) return true;
     auto it = parents_.find(current);
     if (it == parents_.end()) return false;
-    current = lower(it->second);
+    current = lowerName(it->second);
   }
   return false;
 }

@@ -2,7 +2,6 @@
 #include "host/ClassRepository.h"
 
 #include <algorithm>
-#include <cctype>
 #include <fstream>
 #include <memory>
 
@@ -11,11 +10,6 @@
 namespace nrv::host {
 
 namespace {
-
-std::string lower(std::string s) {
-  std::transform(s.begin(), s.end(), s.begin(), [](unsigned char c) { return std::tolower(c); });
-  return s;
-}
 
 std::variant<KeyDecl, std::string> keyFrom(const nlohmann::json& k, const std::string& owner) {
   KeyDecl key;
@@ -57,7 +51,7 @@ std::variant<ClassRepository, std::string> ClassRepository::read(const std::stri
         decl->keys.push_back(std::get<KeyDecl>(std::move(key)));
       }
       decl->namespaces = c.at("namespaces").get<std::vector<std::string>>();
-      repo.byName_[lower(decl->name)] = decl.get();
+      repo.byName_[lowerName(decl->name)] = decl.get();
       repo.classes_.push_back(std::move(decl));
     }
   } catch (const nlohmann::json::exception& e) {
@@ -67,7 +61,7 @@ std::variant<ClassRepository, std::string> ClassRepository::read(const std::stri
 }
 
 const ClassDecl* ClassRepository::find(const std::string& className) const {
-  auto it = byName_.find(lower(className));
+  auto it = byName_.find(lowerName(className));
   return it == byName_.end() ? nullptr : it->second;
 }
 

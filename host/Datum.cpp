@@ -299,6 +299,12 @@ bool sameName(const std::string& a, const std::string& b) {
          strcasecmp(a.c_str(), b.c_str()) == 0;
 }
 
+std::string lowerName(std::string_view name) {
+  std::string out(name);
+  for (char& c : out) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+  return out;
+}
+
 const Datum* findNamed(const NamedData& list, const std::string& name) {
   for (const auto& [n, v] : list) {
     if (sameName(n, name)) return &v;

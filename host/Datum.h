@@ -11,6 +11,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -73,6 +74,8 @@ using NamedData = std::vector<std::pair<std::string, Datum>>;
 
 // CIM names compare case-insensitively.
 bool sameName(const std::string& a, const std::string& b);
+// The name in lower case: the key under which to look a CIM name up.
+std::string lowerName(std::string_view name);
 const Datum* findNamed(const NamedData& list, const std::string& name);
 // Replaces an entry of the same name in place, else appends.
 void setNamed(NamedData& list, std::string name, Datum value);

@@ -6,19 +6,15 @@
 #include <strings.h>
 
 #include <algorithm>
-#include <cctype>
 #include <cstdlib>
 #include <cstring>
 #include <fstream>
 
+#include "host/Datum.h"
+
 namespace nrv::host {
 
 namespace {
-
-std::string lowerCase(std::string text) {
-  std::transform(text.begin(), text.end(), text.begin(), [](unsigned char c) { return std::tolower(c); });
-  return text;
-}
 
 constexpr const char* kCreate = "_Create_";
 constexpr const char* kProviderSuffix = "_Provider";
@@ -118,7 +114,7 @@ std::variant<std::unique_ptr<ModuleLoader>, std::string> ModuleLoader::open(
 
 ModuleLoader::ModuleLoader(std::string path, void* handle, std::vector<std::string> factories)
     : path_(std::move(path)), handle_(handle), factories_(std::move(factories)) {
-  for (const auto& exported : factories_) byLowerName_.emplace(lowerCase(exported), exported);
+  for (const auto& exported : factories_) byLowerName_.emplace(lowerName(exported), exported);
 }
 
 ModuleLoader::~ModuleLoader() { dlclose(handle_); }
@@ -136,7 +132,7 @@ std::optional<std::string> ModuleLoader::factoryFor(const std::string& className
   for (const std::string& candidate :
        {className + kProviderSuffix + tail, className + tail}) {
     // The exported spelling wins, so "nrvtavo_chip" finds "NRVTAVO_Chip_...".
-    if (auto it = byLowerName_.find(lowerCase(candidate)); it != byLowerName_.end()) return it->second;
+    if (auto it = byLowerName_.find(lowerName(candidate)); it != byLowerName_.end()) return it->second;
     if (symbol(candidate) != nullptr) return candidate;
   }
   return std::nullopt;

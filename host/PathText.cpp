@@ -195,12 +195,6 @@ std::variant<Datum, TextError> typedScalar(std::string_view text, CMPIType type,
   }
 }
 
-std::string lower(std::string_view s) {
-  std::string out(s);
-  for (char& c : out) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
-  return out;
-}
-
 // The type of a typed key value `(type)value`, and the value text after it.
 std::variant<std::pair<std::optional<CMPIType>, std::string_view>, TextError> typePrefix(
     std::string_view text) {
@@ -289,7 +283,7 @@ std::variant<PathData, TextError> parsePath(std::string_view input,
   if (schema) {
     if (auto keys = schema(path.className)) {
       declared.emplace();
-      for (auto& k : *keys) declared->emplace(lower(k.name), std::move(k));
+      for (auto& k : *keys) declared->emplace(lowerName(k.name), std::move(k));
     }
   }
   std::unordered_set<std::string> seen;
@@ -298,7 +292,7 @@ std::variant<PathData, TextError> parsePath(std::string_view input,
     if (eq == std::string_view::npos) return TextError{"missing '=' in key binding: " + std::string(part)};
     const std::string_view name = trim(part.substr(0, eq));
     if (!isIdentifier(name)) return TextError{"bad key name: " + std::string(name)};
-    const std::string low = lower(name);
+    const std::string low = lowerName(name);
     if (!seen.insert(low).second) return TextError{"duplicate key: " + std::string(name)};
     const KeyDecl* decl = nullptr;
     if (declared) {

@@ -26,8 +26,7 @@ bool NRV_CIMLogger::wants(int level) const {
 }
 
 void NRV_CIMLogger::log(int level, const char* file, unsigned line, const char* message) {
-  if (level < NRV_INVALID || level >= NRV_INFO || message == nullptr) return;
-  if (!nrv_mode_writes_records(m_Logger.getMode()) || m_MaxRecords == 0) return;
+  if (message == nullptr || !wants(level)) return;
 
   NRV_CIMLogEntry entry;
   entry.level = level;

@@ -35,18 +35,20 @@ NRV_FileLogger::NRV_FileLogger() : NRV_FileLogger(CLogger::instance()) {}
 
 NRV_FileLogger::~NRV_FileLogger() { m_Logger.unregisterSink(this); }
 
+bool NRV_FileLogger::keeps(int level) const {
+  return nrv_level_name(level) != nullptr && nrv_mode_writes_file(m_Logger.getMode()) && m_File &&
+         (!m_bErrorsOnly || level == NRV_ERR || level == NRV_CRIT);
+}
+
 bool NRV_FileLogger::wants(int level) const {
-  if (nrv_level_name(level) == nullptr || !nrv_mode_writes_file(m_Logger.getMode())) return false;
   std::lock_guard<std::mutex> lock(m_Mutex);
-  return m_File && (!m_bErrorsOnly || level == NRV_ERR || level == NRV_CRIT);
+  return keeps(level);
 }
 
 void NRV_FileLogger::log(int level, const char* file, unsigned line, const char* message) {
-  const char* level_name = nrv_level_name(level);
-  if (level_name == nullptr || !nrv_mode_writes_file(m_Logger.getMode())) return;
   std::lock_guard<std::mutex> lock(m_Mutex);
-  if (!m_File) return;
-  if (m_bErrorsOnly && level != NRV_ERR && level != NRV_CRIT) return;
+  if (!keeps(level)) return;
+  const char* level_name = nrv_level_name(level);
   const std::string stamp = Datetime::now().ascii(true);
   // The thread id goes out as an unsigned int to match "%u"; the trailing 'l'
   // belongs to the established line format that log readers expect.

@@ -49,6 +49,8 @@ class NRV_FileLogger : public NRV_LoggerInterface {
   // The trace file at `path` opened for appending (emptied first when
   // `truncate`), or null when it cannot be opened or is not a regular file.
   static File openTraceFile(const char* path, bool truncate);
+  // Whether log() writes a message of `level` now; m_Mutex held.
+  bool keeps(int level) const;
 
   CLogger& m_Logger;
   mutable std::mutex m_Mutex;  // guards the three fields below
