@@ -20,6 +20,12 @@ PathData path(const std::string& text) { return std::get<PathData>(parsePath(tex
 
 TEST(HostThreadsTest, ParallelClientsGetCompleteAnswers) {
   Host host(test::testProvider(), Host::Options{test::platformFile()});
+  // Every MI is made before the clients run: the standard's MI stubs store the broker in the
+  // library's global on each factory call, which would race with a call already running.
+  ASSERT_TRUE(host.invokeMethod(path("TST_Widget.InstanceID=\"W1\""), "SpawnThread").ok());
+  ASSERT_TRUE(host.associators(path("TST_Gadget.Tag=\"G1\"")).ok());
+  ASSERT_TRUE(host.enumerateInstanceNames("root/test", "TST_Gadget").ok());
+  ASSERT_TRUE(host.enumerateInstances("root/test", "TST_Widget").ok());
   std::atomic<int> bad{0};
   std::vector<std::thread> threads;
   for (int t = 0; t < kThreads; ++t) {
