@@ -34,35 +34,47 @@ void load_ahead(const Instances& instances, size_t count, size_t i, size_t bytes
 }
 
 // A class of the SAN catalogue is built aside and published whole (its map
-// swapped in), never changed in place once published: its snapshot may hold
-// the map's own instances, each copied for its handler only as it is
-// delivered, outside the locks, where the copy's reads also bring into the
-// cache what the delivery reads next.  Every other class is copied under
-// the locks.
+// swapped in), never changed in place once published: its readers may share
+// the map's own instances (handlers copy one before changing it), and its
+// keys are as unique as the map's insert made them.  Every other class may
+// change in place and is copied under the locks.
 bool published_whole(const Catalogue_Source& from) {
   return from.catalogue == Catalogue::SAN && from.refresh == nullptr;
 }
 
-// Copies the map into `snapshot` (clones, or the instances themselves when
-// `share`); the caller holds m_DataMutex.  False (snapshot emptied) when two
-// instances have equal keys.
-bool copy_map(Instance_Map& map, Instance_Map& snapshot, bool share) {
+// Takes a reference to each of the map's instances, in map order; the caller
+// holds m_DataMutex.
+void share_map(const Instance_Map& map, std::vector<Instance*>& taken) {
+  const size_t bytes = map.meta_class()->size;
+  taken.reserve(map.size());
+  for (size_t i = 0; i < map.size(); ++i) {
+    load_ahead(map, map.size(), i, bytes);
+    ref(map[i]);
+    taken.push_back(map[i]);
+  }
+}
+
+// Clones the map's instances into `taken`, in map order; the caller holds
+// m_DataMutex.  Nothing taken when two instances have equal keys (a class
+// changed in place may have come to hold such a pair).
+void copy_map(const Instance_Map& map, std::vector<Instance*>& taken) {
+  // The snapshot only checks the keys and is handed out: no reference index.
+  Instance_Map snapshot(map.meta_class(), false);
   const size_t bytes = map.meta_class()->size;
   for (size_t i = 0; i < map.size(); ++i) {
     load_ahead(map, map.size(), i, bytes);
-    Instance* copy = map[i];
-    if (share)
-      ref(copy);
-    else
-      copy = clone(copy);
+    Instance* copy = clone(map[i]);
     if (snapshot.insert(copy) < 0) {
       destroy(copy);  // a refused instance stays ours
       NRV_LOG_AS_AGENT(NRV_CRIT, "Insert failed for %zu", i);
-      snapshot.clear();
-      return false;
+      return;
     }
   }
-  return true;
+  taken.reserve(snapshot.size());
+  for (size_t i = 0; i < snapshot.size(); ++i) {
+    ref(snapshot[i]);
+    taken.push_back(snapshot[i]);
+  }
 }
 
 void log_failure(const Catalogue_Source& from) {
@@ -112,19 +124,17 @@ bool read_map(const Catalogue_Source& from, Work&& work) {
   }
 }
 
-// Hands each instance (a copy of it when `copy_each`: the instances are
-// shared) to the handler, which owns it from then on; the handler's answer to
-// go on or stop is honoured only when `may_stop`.  A handler that throws ends
-// the delivery as a failed read.
+// Hands each instance to the handler, which owns it from then on; the
+// handler's answer to go on or stop is honoured only when `may_stop`.  A
+// handler that throws ends the delivery as a failed read.
 void deliver(const Catalogue_Source& from, std::vector<Instance*>& instances, const Handler& handler,
-             bool may_stop, bool copy_each = false) {
+             bool may_stop) {
   size_t i = 0;
   try {
     while (i < instances.size()) {
       load_ahead(instances, instances.size(), i, instances[i]->meta_class->size);
-      Instance_Ptr taken(instances[i]);
+      Instance* instance = instances[i];
       instances[i++] = nullptr;
-      Instance* instance = copy_each ? clone(taken.get()) : taken.release();
       if (!handler(instance, 0) && may_stop) break;
     }
   } catch (...) {
@@ -143,20 +153,13 @@ int enumerate(const Catalogue_Source& from, const Handler& handler) {
   std::vector<Instance*> taken;
   const bool shared = published_whole(from);
   read_map(from, [&](Instance_Map& map) {
-    // The snapshot only checks the keys and is handed out: no reference index.
-    Instance_Map snapshot(map.meta_class(), false);
-    if (!copy_map(map, snapshot, shared)) return;
-    // Clones are private and handed out as they are, after the locks are
-    // released, rather than cloned a second time; shared instances are
-    // copied one by one as they are delivered.
-    taken.reserve(snapshot.size());
-    for (size_t i = 0; i < snapshot.size(); ++i) {
-      ref(snapshot[i]);
-      taken.push_back(snapshot[i]);
-    }
+    if (shared)
+      share_map(map, taken);
+    else
+      copy_map(map, taken);
   });
   // The handler's answer is not consulted: every instance is delivered.
-  deliver(from, taken, handler, false, shared);
+  deliver(from, taken, handler, false);
   NRV_LOG(NRV_DBG, "%s_Provider::enum_instances()", from.class_name);
   return ENUM_INSTANCES_OK;
 }

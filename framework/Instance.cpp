@@ -198,6 +198,12 @@ void unref(Instance* instance) {
   if (instance && counter(instance).fetch_sub(1, std::memory_order_acq_rel) == 1) destroy_record(instance);
 }
 
+Instance* writable(Instance_Ptr& owned) {
+  // A count of one cannot grow behind our back: only a holder can ref.
+  if (owned && counter(owned.get()).load(std::memory_order_acquire) > 1) owned.reset(clone(owned.get()));
+  return owned.get();
+}
+
 uint8_t* null_flag(Instance* instance, const Meta_Property* mp) {
   uint32_t value_size = is_array(mp) ? 8 : (mp->type < 14 ? type_size[mp->type] : 8);
   return static_cast<uint8_t*>(slot(instance, mp->offset + value_size));

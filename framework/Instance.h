@@ -93,6 +93,11 @@ struct Instance_Unref {
 };
 using Instance_Ptr = std::unique_ptr<Instance, Instance_Unref>;
 
+// The instance to change in place: the held one when this is its only
+// reference, else a clone that `owned` now holds instead, leaving the shared
+// original to its other readers.
+Instance* writable(Instance_Ptr& owned);
+
 // --- comparison and editing ---------------------------------------------------
 
 // True when every key feature of `a` equals the same-named key feature of `b`.

@@ -82,9 +82,11 @@ enum Operation : int {
   OPERATION_ENUM_ASSOCIATORS = 16,
 };
 
-// Receives enumeration results: each instance (owned by the handler from
-// then on) with status 0; answers true to go on.  The closing call passes a
-// null instance and the operation's result.
+// Receives enumeration results: each instance with status 0, the handler
+// owning one reference to it from then on; answers true to go on.  The
+// instance may be shared with a catalogue: a handler that changes it asks
+// for `writable` first.  The closing call passes a null instance and the
+// operation's result.
 using Handler_Proc = bool (*)(Instance* instance, int status, void* data);
 
 struct Handler {

@@ -153,9 +153,11 @@ TEST_F(CatalogueReads, EveryClassAnswersAsTheGenericFallbacks) {
   ASSERT_TRUE(host.moduleLoaded()) << host.loadError();
   ASSERT_NE(host.registration(), nullptr);
   size_t classes = 0, associations = 0, requests = 0, nonempty = 0;
+  std::vector<std::pair<const RegisteredClass*, Result>> before;
   for (const RegisteredClass& c : host.registration()->entries()) {
     if (!has(c, "instance")) continue;
-    Result all = host.enumerateInstances(name_space_of(c), c.className);
+    const Result& all =
+        before.emplace_back(&c, host.enumerateInstances(name_space_of(c), c.className)).second;
     ASSERT_TRUE(all.ok()) << c.className << ": " << all.errorText();
     ++classes;
     for (const InstanceData* instance : sample(all.instances)) {
@@ -179,6 +181,9 @@ TEST_F(CatalogueReads, EveryClassAnswersAsTheGenericFallbacks) {
     }
     associations += has(c, "association") && !all.instances.empty();
   }
+  // Reads share the catalogue's instances: none of them changed one.
+  for (const auto& [c, all] : before)
+    expect_same(host.enumerateInstances(name_space_of(*c), c->className), all, c->className + " after the reads");
   std::printf("compared %zu requests (%zu with results) over %zu classes, %zu associations with instances\n",
               requests, nonempty, classes, associations);
   EXPECT_GT(associations, 50u);
