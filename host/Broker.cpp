@@ -167,7 +167,7 @@ CMPIInstance* getInstance(const CMPIBroker* mb, const CMPIContext* ctx, const CM
   auto outcome = upcall(mb, ctx, op, r, rc);
   if (!outcome || !outcome->ok()) return nullptr;
   for (const Datum& item : outcome->items) {
-    if (item.type == CMPI_instance && !item.isNull) return makeInstance(mb, *item.instance);
+    if (item.type == CMPI_instance && !item.isNull) return makeInstance(mb, *item.instance());
   }
   setStatus(rc, CMPI_RC_ERR_NOT_FOUND);
   return nullptr;
@@ -187,7 +187,7 @@ CMPIObjectPath* createInstance(const CMPIBroker* mb, const CMPIContext* ctx,
   auto outcome = upcall(mb, ctx, op, r, rc);
   if (!outcome || !outcome->ok()) return nullptr;
   for (const Datum& item : outcome->items) {
-    if (item.type == CMPI_ref && !item.isNull) return makeObjectPath(mb, *item.path);
+    if (item.type == CMPI_ref && !item.isNull) return makeObjectPath(mb, *item.path());
   }
   return makeObjectPath(mb, r.path);
 }
@@ -327,7 +327,7 @@ CMPIData getProperty(const CMPIBroker* mb, const CMPIContext* ctx, const CMPIObj
   if (!outcome || !outcome->ok()) return badData();
   for (const Datum& item : outcome->items) {
     if (item.type == CMPI_instance && !item.isNull) {
-      return namedGet(mb, item.instance->properties, name, rc);
+      return namedGet(mb, item.instance()->properties, name, rc);
     }
   }
   setStatus(rc, CMPI_RC_ERR_NOT_FOUND);

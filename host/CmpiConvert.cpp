@@ -128,14 +128,14 @@ CMPIData datumToCmpi(const void* owner, const Datum& datum) {
   }
   d.state = CMPI_goodValue;
   if (datum.isArray()) {
-    d.value.array = makeArray(owner, *datum.array);
+    d.value.array = makeArray(owner, *datum.array());
     return d;
   }
   switch (datum.type) {
     case CMPI_string: d.value.string = makeString(owner, datum.text); break;
-    case CMPI_dateTime: d.value.dateTime = makeDateTime(owner, datum.dateTime); break;
-    case CMPI_ref: d.value.ref = makeObjectPath(owner, *datum.path); break;
-    case CMPI_instance: d.value.inst = makeInstance(owner, *datum.instance); break;
+    case CMPI_dateTime: d.value.dateTime = makeDateTime(owner, datum.dateTime()); break;
+    case CMPI_ref: d.value.ref = makeObjectPath(owner, *datum.path()); break;
+    case CMPI_instance: d.value.inst = makeInstance(owner, *datum.instance()); break;
     default: d.value = datum.scalar; break;
   }
   return d;

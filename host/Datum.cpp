@@ -201,7 +201,7 @@ Datum Datum::reference(PathData value) {
   Datum d;
   d.type = CMPI_ref;
   d.isNull = false;
-  d.path = std::make_shared<const PathData>(std::move(value));
+  d.hold(Held::Path, std::make_shared<const PathData>(std::move(value)));
   return d;
 }
 
@@ -211,7 +211,7 @@ Datum Datum::embedded(std::shared_ptr<const InstanceData> value) {
   Datum d;
   d.type = CMPI_instance;
   d.isNull = false;
-  d.instance = std::move(value);
+  d.hold(Held::Instance, std::move(value));
   return d;
 }
 
@@ -219,7 +219,9 @@ Datum Datum::time(DateTimeValue value) {
   Datum d;
   d.type = CMPI_dateTime;
   d.isNull = false;
-  d.dateTime = value;
+  d.scalar.uint64 = value.micros;
+  d.interval_ = value.interval;
+  d.utcOffsetMinutes_ = static_cast<std::int16_t>(value.utcOffsetMinutes);
   return d;
 }
 
@@ -230,7 +232,7 @@ Datum Datum::arrayOf(CMPIType elementType, std::vector<Datum> elements) {
   auto data = std::make_shared<ArrayData>();
   data->elementType = elementType;
   data->elements = std::move(elements);
-  d.array = std::move(data);
+  d.hold(Held::Array, std::move(data));
   return d;
 }
 
@@ -238,7 +240,7 @@ Datum Datum::sharedArray(std::shared_ptr<const ArrayData> value) {
   Datum d;
   d.type = static_cast<CMPIType>(value->elementType | CMPI_ARRAY);
   d.isNull = false;
-  d.array = std::move(value);
+  d.hold(Held::Array, std::move(value));
   return d;
 }
 
@@ -246,9 +248,7 @@ void Datum::setText(const char* value) {
   type = CMPI_string;
   isNull = false;
   text.assign(value);
-  path.reset();
-  instance.reset();
-  array.reset();
+  hold(Held::Nothing, nullptr);
 }
 
 CMPISint64 Datum::asInteger() const {
@@ -271,20 +271,20 @@ bool Datum::operator==(const Datum& o) const {
   if (type != o.type || isNull != o.isNull) return false;
   if (isNull) return true;
   if (isArray()) {
-    if (array->elements.size() != o.array->elements.size()) return false;
-    for (size_t i = 0; i < array->elements.size(); ++i) {
-      if (!(array->elements[i] == o.array->elements[i])) return false;
+    if (array()->elements.size() != o.array()->elements.size()) return false;
+    for (size_t i = 0; i < array()->elements.size(); ++i) {
+      if (!(array()->elements[i] == o.array()->elements[i])) return false;
     }
     return true;
   }
   switch (type) {
     case CMPI_string: return text == o.text;
     case CMPI_dateTime:
-      return dateTime.micros == o.dateTime.micros && dateTime.interval == o.dateTime.interval;
-    case CMPI_ref: return *path == *o.path;
+      return scalar.uint64 == o.scalar.uint64 && interval_ == o.interval_;
+    case CMPI_ref: return *path() == *o.path();
     case CMPI_instance:
-      return instance->path == o.instance->path &&
-             instance->properties == o.instance->properties;
+      return instance()->path == o.instance()->path &&
+             instance()->properties == o.instance()->properties;
     case CMPI_real32: return scalar.real32 == o.scalar.real32;
     case CMPI_real64: return scalar.real64 == o.scalar.real64;
     case CMPI_ptr: return scalar.dataPtr.ptr == o.scalar.dataPtr.ptr;

@@ -37,14 +37,24 @@ struct DateTimeValue {
 };
 
 struct Datum {
+ private:
+  // A Datum is small (an instance holds one per property): the path, instance or array it
+  // holds shares one pointer, and a datetime keeps its microseconds in `scalar`.
+  enum class Held : std::uint8_t { Nothing, Path, Instance, Array };
+
+ public:
   CMPIType type = CMPI_null;   // CMPI type code; CMPI_ARRAY is set for arrays
   bool isNull = true;
+
+ private:
+  // Packed beside the two above.
+  Held held_ = Held::Nothing;
+  bool interval_ = false;
+  std::int16_t utcOffsetMinutes_ = 0;
+
+ public:
   CMPIValue scalar{};          // numbers, boolean, char16, raw data pointer
   std::string text;            // CMPI_string
-  DateTimeValue dateTime;      // CMPI_dateTime
-  std::shared_ptr<const PathData> path;          // CMPI_ref
-  std::shared_ptr<const InstanceData> instance;  // CMPI_instance
-  std::shared_ptr<const ArrayData> array;        // arrays
 
   static Datum null(CMPIType type);
   static Datum string(std::string value);
@@ -64,10 +74,31 @@ struct Datum {
   // Makes this a string in place (no Datum made and moved, as string() does).
   void setText(const char* value);
 
+  // What a reference, an embedded instance or an array holds (nullptr for any other value);
+  // it lives as long as this Datum or a copy of it.
+  const PathData* path() const { return held_ == Held::Path ? static_cast<const PathData*>(object_.get()) : nullptr; }
+  const InstanceData* instance() const {
+    return held_ == Held::Instance ? static_cast<const InstanceData*>(object_.get()) : nullptr;
+  }
+  const ArrayData* array() const {
+    return held_ == Held::Array ? static_cast<const ArrayData*>(object_.get()) : nullptr;
+  }
+  // True when no copy of this Datum shares what it holds.
+  bool holdsAlone() const { return object_.use_count() == 1; }
+  // A CMPI_dateTime's value.
+  DateTimeValue dateTime() const { return DateTimeValue{scalar.uint64, interval_, utcOffsetMinutes_}; }
+
   bool isArray() const { return (type & CMPI_ARRAY) != 0; }
   // Integer view of any integer type (for tests and printing).
   CMPISint64 asInteger() const;
   bool operator==(const Datum& other) const;
+
+ private:
+  void hold(Held kind, std::shared_ptr<const void> object) {
+    held_ = kind;
+    object_ = std::move(object);
+  }
+  std::shared_ptr<const void> object_;
 };
 
 using NamedData = std::vector<std::pair<std::string, Datum>>;

@@ -21,12 +21,12 @@ Result toResult(Outcome outcome) {
     if (item.type == CMPI_instance) {
       // Every instance the host stores is made non-const (Datum::embedded), so the sole
       // holder may move it out instead of copying it.
-      if (item.instance.use_count() == 1)
-        r.instances.push_back(std::move(const_cast<InstanceData&>(*item.instance)));
+      if (item.holdsAlone())
+        r.instances.push_back(std::move(const_cast<InstanceData&>(*item.instance())));
       else
-        r.instances.push_back(*item.instance);
+        r.instances.push_back(*item.instance());
     } else if (item.type == CMPI_ref) {
-      r.paths.push_back(*item.path);
+      r.paths.push_back(*item.path());
     }
   }
   r.returnValue = std::move(outcome.returnValue);

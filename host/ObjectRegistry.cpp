@@ -7,13 +7,37 @@ namespace {
 
 thread_local Arena* tCurrentArena = nullptr;
 
-// The calling thread's last look-up, good while no object has been removed since.
-struct LastLookup {
-  const void* handle = nullptr;
-  EncObject* object = nullptr;
+// The calling thread's last few look-ups, good while no object has been removed since: a
+// provider that fills an instance with arrays goes back and forth between a handful of
+// objects.
+struct RecentLookups {
+  static constexpr std::size_t kSize = 4;
+  struct Entry {
+    const void* handle = nullptr;
+    EncObject* object = nullptr;
+  };
+  Entry entries[kSize];
+  std::size_t next = 0;
   std::uint64_t removals = 0;
+
+  EncObject* find(const void* handle, std::uint64_t now) {
+    if (removals != now) {
+      *this = RecentLookups{};
+      removals = now;
+      return nullptr;
+    }
+    for (const Entry& e : entries)
+      if (e.handle == handle) return e.object;
+    return nullptr;
+  }
+  void remember(const void* handle, EncObject* object, std::uint64_t now) {
+    if (removals != now) *this = RecentLookups{};
+    removals = now;
+    entries[next] = {handle, object};
+    next = (next + 1) % kSize;
+  }
 };
-thread_local LastLookup tLast;
+thread_local RecentLookups tRecent;
 
 // Arenas pushed by attachThread, with the arena each one displaced.
 struct AttachedArena {
@@ -38,19 +62,22 @@ void ObjectRegistry::add(std::unique_ptr<EncObject> object, bool detached) {
   Arena* arena = detached ? nullptr : tCurrentArena;
   object->arena_ = arena;
   const void* handle = object->handle();
+  EncObject* raw = object.get();
   std::lock_guard<std::mutex> lock(mu_);
   if (arena != nullptr) arena->handles_.push_back(handle);
   live_[handle] = std::move(object);
+  // A new object is about to be used by the thread that made it.
+  tRecent.remember(handle, raw, removals_.load(std::memory_order_relaxed));
 }
 
 EncObject* ObjectRegistry::lookup(const void* handle) {
   if (handle == nullptr) return nullptr;
-  if (handle == tLast.handle && tLast.removals == removals_.load(std::memory_order_acquire)) return tLast.object;
+  if (EncObject* o = tRecent.find(handle, removals_.load(std::memory_order_acquire))) return o;
   std::lock_guard<std::mutex> lock(mu_);
   auto it = live_.find(handle);
   if (it == live_.end()) return nullptr;
-  tLast = {handle, it->second.get(), removals_.load(std::memory_order_relaxed)};
-  return tLast.object;
+  tRecent.remember(handle, it->second.get(), removals_.load(std::memory_order_relaxed));
+  return it->second.get();
 }
 
 bool ObjectRegistry::contains(const void* handle) { return lookup(handle) != nullptr; }

@@ -100,8 +100,8 @@ class ObjectRegistry {
   EncObject* lookup(const void* handle);
   void freeArena(Arena* arena);
 
-  // Bumped by every removal: a thread's last look-up stays good while it is unchanged, so
-  // that the many calls on one object (setting each property) need no lock.
+  // Bumped by every removal: a thread's recent look-ups stay good while it is unchanged, so
+  // that the many calls on a few objects (setting each property) need no lock.
   std::atomic<std::uint64_t> removals_{0};
   std::mutex mu_;
   std::unordered_map<const void*, std::unique_ptr<EncObject>> live_;

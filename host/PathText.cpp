@@ -393,7 +393,7 @@ std::string formatValue(const Datum& v) {
   if (v.isArray()) {
     std::string out = "{";
     const char* sep = "";
-    for (const auto& e : v.array->elements) {
+    for (const auto& e : v.array()->elements) {
       out += sep + formatValue(e);
       sep = ", ";
     }
@@ -406,11 +406,11 @@ std::string formatValue(const Datum& v) {
     case CMPI_real32: return formatReal(v.scalar.real32);
     case CMPI_real64: return formatReal(v.scalar.real64);
     case CMPI_uint64: return std::to_string(v.scalar.uint64);
-    case CMPI_dateTime: return quote(v.dateTime.text());
-    case CMPI_ref: return quote(formatPath(*v.path));
+    case CMPI_dateTime: return quote(v.dateTime().text());
+    case CMPI_ref: return quote(formatPath(*v.path()));
     case CMPI_instance: {
-      std::string out = "instance of " + v.instance->path.className + " {";
-      for (const auto& [name, value] : v.instance->properties) {
+      std::string out = "instance of " + v.instance()->path.className + " {";
+      for (const auto& [name, value] : v.instance()->properties) {
         out += " " + name + " = " + formatValue(value) + ";";
       }
       return out + " }";

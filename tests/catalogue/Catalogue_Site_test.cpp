@@ -151,7 +151,7 @@ const std::map<std::string, size_t> kSampleCounts = {
 
 
 std::string text(const Datum* d) { return d && d->type == CMPI_string ? d->text : std::string(); }
-const PathData& ref(const Datum* d) { return *d->path; }
+const PathData& ref(const Datum* d) { return *d->path(); }
 
 class CatalogueSite : public ::testing::Test {
  protected:
@@ -351,7 +351,7 @@ TEST_F(CatalogueSite, PortsCarryTheirIdentitiesAndVNICPairs) {
     const Datum* descriptions = findNamed(port.properties, "IdentifyingDescriptions");
     ASSERT_NE(descriptions, nullptr);
     std::vector<std::string> names;
-    for (const Datum& d : descriptions->array->elements) names.push_back(d.text);
+    for (const Datum& d : descriptions->array()->elements) names.push_back(d.text);
     ASSERT_GE(names.size(), 3u) << formatPath(port.path);
     EXPECT_EQ(names[1], "SerialNumber:PhysicalPortNumber");
     if (names.size() == 3) continue;  // iSCSI functions come after the vNIC pass

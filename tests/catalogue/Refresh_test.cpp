@@ -106,7 +106,7 @@ TEST_F(Refresh, ALinkGoingDownShowsOnTheNextReadAndASecondReadAsksNothing) {
 
 TEST_F(Refresh, CardPortControllerAndFCPortFollowTheSite) {
   const HostInstance nic = find("NRVTAVO_EthernetPort", "DeviceID", kNicPort);
-  const std::string port_key = property(nic, "OtherIdentifyingInfo")->array->elements[1].text;
+  const std::string port_key = property(nic, "OtherIdentifyingInfo")->array()->elements[1].text;
   change_site();
   const HostInstance card = find("NRVTAVO_Card", "SerialNumber", "NV52C4213A07719");
   EXPECT_EQ(property(card, "BoardTemperature")->scalar.sint32, 77);
@@ -115,7 +115,7 @@ TEST_F(Refresh, CardPortControllerAndFCPortFollowTheSite) {
   EXPECT_EQ(property(controller, "PhyLinkDownReason")->scalar.uint32, 5u);
   const HostInstance fc = find("NRVTAVO_FCPort", "DeviceID", kFCoEPort);
   EXPECT_EQ(property(fc, "Speed")->scalar.uint64, 0u);
-  EXPECT_EQ(property(fc, "StatusDescriptions")->array->elements[0].text, "Other");  // state 6, FCoE reading
+  EXPECT_EQ(property(fc, "StatusDescriptions")->array()->elements[0].text, "Other");  // state 6, FCoE reading
 }
 
 TEST_F(Refresh, StatisticsCountBytesInWordsAndKeepUndeliveredCounters) {

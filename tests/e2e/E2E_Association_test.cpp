@@ -52,7 +52,7 @@ TEST_F(Associations, NamesAndReferencesFollowTheLinks) {
     const Datum* group = property(link, "GroupComponent");
     ASSERT_NE(group, nullptr);
     ASSERT_EQ(group->type, CMPI_ref);
-    EXPECT_EQ(findNamed(group->path->keys, "Tag")->text, "A");
+    EXPECT_EQ(findNamed(group->path()->keys, "Tag")->text, "A");
   }
 
   Result link_names = host_->referenceNames(chip_path("Y"));

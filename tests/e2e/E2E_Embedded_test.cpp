@@ -36,13 +36,13 @@ TEST_F(Embedded, EmbeddedInstancesRoundTripThroughAMethod) {
   const Datum* goals = findNamed(result.outArgs, "SupportedGoalSettings");
   ASSERT_NE(goals, nullptr);
   ASSERT_EQ(goals->type, CMPI_instanceA);
-  ASSERT_EQ(goals->array->elements.size(), 2u);
+  ASSERT_EQ(goals->array()->elements.size(), 2u);
   for (size_t i = 0; i < 2; ++i) {
-    const Datum& goal = goals->array->elements[i];
+    const Datum& goal = goals->array()->elements[i];
     ASSERT_EQ(goal.type, CMPI_instance);
-    EXPECT_EQ(goal.instance->path.className, templates[i].path.className);
-    EXPECT_EQ(property(*goal.instance, "InstanceID")->text, findNamed(templates[i].properties, "InstanceID")->text);
-    EXPECT_EQ(property(*goal.instance, "ElementName")->text,
+    EXPECT_EQ(goal.instance()->path.className, templates[i].path.className);
+    EXPECT_EQ(property(*goal.instance(), "InstanceID")->text, findNamed(templates[i].properties, "InstanceID")->text);
+    EXPECT_EQ(property(*goal.instance(), "ElementName")->text,
               "goal: " + findNamed(templates[i].properties, "ElementName")->text);
   }
 }
@@ -65,12 +65,12 @@ TEST_F(Embedded, EmbeddedObjectPropertiesHoldAnInstanceOrAPath) {
   const Datum* in = property(got.instances.at(0), "JobInParameters");
   ASSERT_NE(in, nullptr);
   ASSERT_EQ(in->type, CMPI_instance);
-  EXPECT_EQ(in->instance->path.className, "NRVTAVO_Card");
-  EXPECT_EQ(property(*in->instance, "Model")->text, "LPe");
+  EXPECT_EQ(in->instance()->path.className, "NRVTAVO_Card");
+  EXPECT_EQ(property(*in->instance(), "Model")->text, "LPe");
   const Datum* out = property(got.instances.at(0), "JobOutParameters");
   ASSERT_NE(out, nullptr);
   ASSERT_EQ(out->type, CMPI_instance);
-  EXPECT_EQ(property(*out->instance, "Tag")->text, "Q");
+  EXPECT_EQ(property(*out->instance(), "Tag")->text, "Q");
 }
 
 }  // namespace

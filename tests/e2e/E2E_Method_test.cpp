@@ -22,7 +22,7 @@ TEST_F(Methods, ParametersArriveAndOutputsComeBack) {
   const Datum* job = findNamed(result.outArgs, "Job");
   ASSERT_NE(job, nullptr);
   ASSERT_EQ(job->type, CMPI_ref);
-  EXPECT_EQ(findNamed(job->path->keys, "InstanceID")->text, "NRV:Job:1");
+  EXPECT_EQ(findNamed(job->path()->keys, "InstanceID")->text, "NRV:Job:1");
 }
 
 TEST_F(Methods, AMethodNameInAnotherCaseReachesTheMethod) {

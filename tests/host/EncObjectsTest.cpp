@@ -277,8 +277,8 @@ TEST_F(EncObjectsTest, ResultRefusesDeadObjects) {
   EXPECT_EQ(CMReturnDone(r).rc, CMPI_RC_OK);
   ASSERT_EQ(sink->items.size(), 3u);
   EXPECT_TRUE(sink->done);
-  EXPECT_EQ(findNamed(sink->items[0].instance->properties, "Count")->scalar.uint32, 1u);
-  EXPECT_EQ(findNamed(sink->items[1].instance->properties, "Count")->scalar.uint32, 2u);
+  EXPECT_EQ(findNamed(sink->items[0].instance()->properties, "Count")->scalar.uint32, 1u);
+  EXPECT_EQ(findNamed(sink->items[1].instance()->properties, "Count")->scalar.uint32, 2u);
   EXPECT_EQ(sink->items[2].scalar.uint32, 4u);
 }
 

@@ -61,8 +61,8 @@ TEST_F(HostTest, EnumerateInstancesCarriesEveryType) {
   EXPECT_EQ(prop(w1, "Count").scalar.uint16, 1);
   EXPECT_EQ(prop(w1, "Enabled").type, CMPI_boolean);
   EXPECT_EQ(prop(w1, "Tags").type, CMPI_stringA);
-  EXPECT_EQ(prop(w1, "Tags").array->elements[1].text, "W1");
-  EXPECT_EQ(prop(w1, "Created").dateTime.text(), "20240102030405.000000+000");
+  EXPECT_EQ(prop(w1, "Tags").array()->elements[1].text, "W1");
+  EXPECT_EQ(prop(w1, "Created").dateTime().text(), "20240102030405.000000+000");
   EXPECT_EQ(prop(w1, "Label").text, "widget W1");
   EXPECT_TRUE(prop(w1, "Nothing").isNull);
   EXPECT_EQ(ObjectRegistry::instance().liveCount(host.broker()), 0u);
@@ -171,7 +171,7 @@ TEST_F(HostTest, AssociationsFromEitherEnd) {
   Result refs = host.references(w1);
   ASSERT_EQ(refs.instances.size(), 1u);
   EXPECT_EQ(prop(refs.instances[0], "Gadget").type, CMPI_ref);
-  EXPECT_EQ(prop(refs.instances[0], "Gadget").path->keys[0].second.text, "G1");
+  EXPECT_EQ(prop(refs.instances[0], "Gadget").path()->keys[0].second.text, "G1");
   Result refNames = host.referenceNames(w1);
   ASSERT_EQ(refNames.paths.size(), 1u);
   EXPECT_EQ(refNames.paths[0].className, "TST_WidgetGadget");

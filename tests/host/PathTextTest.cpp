@@ -61,8 +61,8 @@ TEST(PathTextTest, KeysTakeTheTypesTheClassDeclares) {
   const std::string left = "Left=\"root/a:W.Id=\\\"x\\\"\"";
   PathData p = mustParse("root/a:Assoc." + left, testKeys);
   ASSERT_EQ(p.keys[0].second.type, CMPI_ref);
-  EXPECT_EQ(p.keys[0].second.path->className, "W");
-  EXPECT_EQ(p.keys[0].second.path->keys[0].second.text, "x");
+  EXPECT_EQ(p.keys[0].second.path()->className, "W");
+  EXPECT_EQ(p.keys[0].second.path()->keys[0].second.text, "x");
   EXPECT_EQ(mustParse("root/a:W.Slot=7", testKeys).keys[0].second.type, CMPI_uint16);
   EXPECT_EQ(mustParse("K.Note=\"a.b=1\"").keys[0].second.type, CMPI_string);
   EXPECT_EQ(mustParse("root/a:Other." + left).keys[0].second.type, CMPI_string);
@@ -113,7 +113,7 @@ TEST(PathTextTest, TypedValues) {
   EXPECT_TRUE(std::holds_alternative<TextError>(parseValue("2024", CMPI_dateTime)));
   auto ref = parseValue("\"root/a:W.Id=\\\"x\\\"\"", CMPI_ref);
   ASSERT_TRUE(std::holds_alternative<Datum>(ref));
-  EXPECT_EQ(std::get<Datum>(ref).path->className, "W");
+  EXPECT_EQ(std::get<Datum>(ref).path()->className, "W");
 }
 
 TEST(PathTextTest, ArrayValues) {
@@ -121,15 +121,15 @@ TEST(PathTextTest, ArrayValues) {
   ASSERT_TRUE(std::holds_alternative<Datum>(a));
   const Datum& d = std::get<Datum>(a);
   EXPECT_EQ(d.type, CMPI_uint16A);
-  EXPECT_EQ(d.array->elements.size(), 3u);
+  EXPECT_EQ(d.array()->elements.size(), 3u);
   EXPECT_EQ(formatValue(d), "{1, 2, 3}");
   auto s = parseValue("{\"a,b\", \"c\"}");
   ASSERT_TRUE(std::holds_alternative<Datum>(s));
-  EXPECT_EQ(std::get<Datum>(s).array->elements[0].text, "a,b");
+  EXPECT_EQ(std::get<Datum>(s).array()->elements[0].text, "a,b");
   EXPECT_TRUE(std::holds_alternative<TextError>(parseValue("{1, \"x\"}")));
   EXPECT_TRUE(std::holds_alternative<TextError>(parseValue("{1, 2", CMPIType(CMPI_uint8A))));
   EXPECT_TRUE(std::holds_alternative<TextError>(parseValue("{{1}}")));
-  EXPECT_EQ(std::get<Datum>(parseValue("{}", CMPIType(CMPI_stringA))).array->elements.size(), 0u);
+  EXPECT_EQ(std::get<Datum>(parseValue("{}", CMPIType(CMPI_stringA))).array()->elements.size(), 0u);
 }
 
 TEST(PathTextTest, Assignments) {

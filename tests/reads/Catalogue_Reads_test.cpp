@@ -120,7 +120,7 @@ std::vector<const InstanceData*> sample(const std::vector<InstanceData>& all) {
 std::vector<std::pair<std::string, PathData>> ends_of(const InstanceData& association) {
   std::vector<std::pair<std::string, PathData>> ends;
   for (const auto& [name, value] : association.properties)
-    if (value.type == CMPI_ref && value.path) ends.emplace_back(name, *value.path);
+    if (value.type == CMPI_ref && value.path()) ends.emplace_back(name, *value.path());
   return ends;
 }
 
