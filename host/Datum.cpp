@@ -292,11 +292,11 @@ bool Datum::operator==(const Datum& o) const {
   }
 }
 
-bool sameName(const std::string& a, const std::string& b) {
+bool sameName(std::string_view a, std::string_view b) {
   // Most names that differ differ in length or in their first letter.
   return a.size() == b.size() && (a.empty() || std::tolower(static_cast<unsigned char>(a[0])) ==
                                                    std::tolower(static_cast<unsigned char>(b[0]))) &&
-         strcasecmp(a.c_str(), b.c_str()) == 0;
+         strncasecmp(a.data(), b.data(), a.size()) == 0;
 }
 
 std::string lowerName(std::string_view name) {
@@ -305,21 +305,21 @@ std::string lowerName(std::string_view name) {
   return out;
 }
 
-const Datum* findNamed(const NamedData& list, const std::string& name) {
+const Datum* findNamed(const NamedData& list, std::string_view name) {
   for (const auto& [n, v] : list) {
     if (sameName(n, name)) return &v;
   }
   return nullptr;
 }
 
-void setNamed(NamedData& list, std::string name, Datum value) {
+void setNamed(NamedData& list, std::string_view name, Datum value) {
   for (auto& [n, v] : list) {
     if (sameName(n, name)) {
       v = std::move(value);
       return;
     }
   }
-  list.emplace_back(std::move(name), std::move(value));
+  list.emplace_back(std::string(name), std::move(value));
 }
 
 bool PathData::operator==(const PathData& o) const {
@@ -332,7 +332,7 @@ bool PathData::operator==(const PathData& o) const {
   return true;
 }
 
-bool InstanceData::admits(const std::string& name) const {
+bool InstanceData::admits(std::string_view name) const {
   if (!filter) return true;
   for (const auto& n : *filter) {
     if (sameName(n, name)) return true;

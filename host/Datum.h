@@ -104,12 +104,12 @@ struct Datum {
 using NamedData = std::vector<std::pair<std::string, Datum>>;
 
 // CIM names compare case-insensitively.
-bool sameName(const std::string& a, const std::string& b);
+bool sameName(std::string_view a, std::string_view b);
 // The name in lower case: the key under which to look a CIM name up.
 std::string lowerName(std::string_view name);
-const Datum* findNamed(const NamedData& list, const std::string& name);
+const Datum* findNamed(const NamedData& list, std::string_view name);
 // Replaces an entry of the same name in place, else appends.
-void setNamed(NamedData& list, std::string name, Datum value);
+void setNamed(NamedData& list, std::string_view name, Datum value);
 
 struct PathData {
   std::string nameSpace;
@@ -126,7 +126,7 @@ struct InstanceData {
   std::optional<std::vector<std::string>> filter;
   std::vector<std::string> filterKeys;
 
-  bool admits(const std::string& name) const;
+  bool admits(std::string_view name) const;
 };
 
 struct ArrayData {
