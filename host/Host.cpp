@@ -1,6 +1,7 @@
 // Host: module loading, request routing with the shutdown gate, and the C++ operation API.
 #include "host/Host.h"
 
+#include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 
@@ -16,6 +17,8 @@ Result toResult(Outcome outcome) {
   Result r;
   r.rc = outcome.rc;
   r.message = std::move(outcome.message);
+  r.instances.reserve(std::count_if(outcome.items.begin(), outcome.items.end(),
+                                    [](const Datum& item) { return item.type == CMPI_instance; }));
   for (auto& item : outcome.items) {
     if (item.isNull) continue;
     if (item.type == CMPI_instance) {
