@@ -22,6 +22,8 @@ namespace {
 // How many instances ahead a loop over a class's instances loads the next
 // ones: far enough to hide a memory access, near enough to stay in the cache.
 constexpr size_t kPrefetchAhead = 4;
+// How far ahead a loop that only touches each instance's header loads it.
+constexpr size_t kHeadersAhead = 32;
 
 // Before a loop works on `instances[i]` (a map or a vector of `count`
 // instances of at least `bytes` each): the instance two steps ahead starts
@@ -45,10 +47,11 @@ bool published_whole(const Catalogue_Source& from) {
 // Takes a reference to each of the map's instances, in map order; the caller
 // holds m_DataMutex.
 void share_map(const Instance_Map& map, std::vector<Instance*>& taken) {
-  const size_t bytes = map.meta_class()->size;
   taken.reserve(map.size());
   for (size_t i = 0; i < map.size(); ++i) {
-    load_ahead(map, map.size(), i, bytes);
+    // Only the header (the reference count) is touched here, in a loop so
+    // short that the loads must start far ahead; the delivery loads the rest.
+    if (i + kHeadersAhead < map.size()) prefetch_instance(map[i + kHeadersAhead], sizeof(Instance));
     ref(map[i]);
     taken.push_back(map[i]);
   }
