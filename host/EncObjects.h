@@ -80,7 +80,7 @@ class EncArray : public EncBase<CMPIArray, CMPIArrayFT, EncKind::Array> {
   ArrayData& edit();
   std::shared_ptr<const ArrayData> share() const { return data_; }
 
-  std::vector<const void*> setHandles;  // per element: the object set into it, if any
+  std::vector<const void*> setHandles;  // per element: the object set into it; empty until one is
 
  private:
   std::shared_ptr<ArrayData> data_;

@@ -132,9 +132,12 @@ CMPIStatus arraySet(const CMPIArray* a, CMPICount index, const CMPIValue* value,
   const CMPIrc rc = datumFromCmpi(value, type, d);
   if (rc != CMPI_RC_OK) return makeStatus(rc);
   o->edit().elements[index] = std::move(d);
-  o->setHandles.resize(o->data().elements.size());
+  // Handles are only tracked once an object has been set: arrays of plain values need none.
   const bool object = (type & CMPI_ENC) != 0 && type != CMPI_chars && value != nullptr;
-  o->setHandles[index] = object ? value->inst : nullptr;
+  if (object || index < o->setHandles.size()) {
+    o->setHandles.resize(o->data().elements.size());
+    o->setHandles[index] = object ? value->inst : nullptr;
+  }
   return makeStatus(CMPI_RC_OK);
 }
 
