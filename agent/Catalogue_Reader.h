@@ -1,14 +1,16 @@
 // The provider side of the agent: taking and dropping the agent in a
 // provider's load and unload, and the reads every catalogue-backed provider
 // performs (wait for the catalogue, read the class's map under the agent's
-// locks, hand out clones): the enumeration, and the get-instance, references
-// and associator names that answer from the map's key and reference indexes
+// locks, hand out clones, or for a class published whole its instances
+// themselves): the enumeration, and the get-instance, references and
+// associator names that answer from the map's key and reference indexes
 // what an enumeration would have answered.
 //
 // Contract: none of these throws.  The enumeration always answers 0; it
 // delivers either every instance of the map or, when the map holds two
-// instances with equal keys or something fails, none.  The handler owns what
-// it is given.  The other reads answer as the enumeration-based fallbacks do:
+// instances with equal keys or something fails, none.  The handler owns a
+// reference to what it is given and changes a shared instance only through
+// `writable`.  The other reads answer as the enumeration-based fallbacks do:
 // not found (get) or an empty success when nothing matches or reading fails.
 #pragma once
 

@@ -1,11 +1,12 @@
 // Catalogue_Provider<C>: the one provider template behind every class whose
 // instances come from the provider agent's catalogue.  load/unload take and
-// drop the agent; enum_instances hands out clones of C's map; get instance
-// looks the keys up in the map, and for association classes references and
-// associator names come from the map's reference index, answering what the
-// dispatch layer's enumeration-based fallbacks would (which still serve when
-// NRV_GENERIC_READS is set).  Writes and every extrinsic method of the class
-// are unsupported (INVOKE_METHOD_UNSUPPORTED).
+// drop the agent; enum_instances hands out C's instances (shared when C is
+// published whole, else clones); get instance looks the keys up in the map,
+// and for association classes references and associator names come from the
+// map's reference index, answering what the dispatch layer's
+// enumeration-based fallbacks would (which still serve when NRV_GENERIC_READS
+// is set).  Writes and every extrinsic method of the class are unsupported
+// (INVOKE_METHOD_UNSUPPORTED).
 #pragma once
 
 #include <span>

@@ -2,7 +2,8 @@
 // handlers that turn each delivered instance into an object path or a CMPI
 // instance (or fetch it from the CIMOM).
 //
-// Contract: a handler owns each instance it receives and releases every CMPI
+// Contract: a handler owns a reference to each instance it receives (and
+// changes a shared one only through `writable`) and releases every CMPI
 // object it creates right after returning it, so an enumeration holds one
 // object at a time.  A conversion failure stops further delivery and is kept
 // in `error`; it does not change the operation's return code.
