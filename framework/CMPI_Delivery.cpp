@@ -37,10 +37,12 @@ bool deliver_instance(Instance* instance, int, void* data) {
   if (delivery == nullptr) return false;
   CMPI_Ptr<CMPIObjectPath> path;
   if (!make_path(delivery, instance, path)) return false;
-  // A shared instance (a catalogue's own) is read, never changed.
+  // A shared instance (a catalogue's own) is read, never changed: from here
+  // on the instance is whichever one `owned` holds.
   if (delivery->apply_list && delivery->properties) apply_property_list(writable(owned), delivery->properties, false);
+  const Instance* delivered = owned.get();
   CMPI_Ptr<CMPIInstance> cmpi_instance;
-  CMPIrc rc = make_cmpi_instance(delivery->broker, owned.get(), delivery->name_space_for(instance), path.get(),
+  CMPIrc rc = make_cmpi_instance(delivery->broker, delivered, delivery->name_space_for(delivered), path.get(),
                                  delivery->properties, cmpi_instance);
   if (rc != CMPI_RC_OK) {
     delivery->error = rc;
