@@ -19,14 +19,6 @@ bool feature_is_null(const Instance* instance, const Meta_Feature* feature) {
   return !is_reference_array(mr) && reference_of(instance, mr) == nullptr;
 }
 
-// The string a scalar string property holds; null for every other feature.
-const String* scalar_string(const Instance* instance, const Meta_Feature* feature) {
-  if (!(feature->flags & FLAG_PROPERTY)) return nullptr;
-  auto* mp = reinterpret_cast<const Meta_Property*>(feature);
-  if (mp->type != STRING || is_array(mp)) return nullptr;
-  return static_cast<const String*>(slot(instance, mp->offset));
-}
-
 }  // namespace
 
 int Container::set_chars(const char* name, const char* chars, uint32_t flags) {

@@ -147,12 +147,15 @@ void prefetch_instance(const Instance* instance, size_t bytes) {
 void prefetch_strings(const Instance* instance) {
   if (instance == nullptr) return;
   const Meta_Class* mc = instance->meta_class;
-  for (size_t i = 0; i < mc->num_meta_features; ++i) {
-    const Meta_Feature* mf = mc->meta_features[i];
-    if (!(mf->flags & FLAG_PROPERTY)) continue;
-    auto* mp = reinterpret_cast<const Meta_Property*>(mf);
-    if (mp->type == STRING && !is_array(mp)) static_cast<const String*>(slot(instance, mp->offset))->prefetch();
-  }
+  for (size_t i = 0; i < mc->num_meta_features; ++i)
+    if (const String* text = scalar_string(instance, mc->meta_features[i])) text->prefetch();
+}
+
+const String* scalar_string(const Instance* instance, const Meta_Feature* feature) {
+  if (!(feature->flags & FLAG_PROPERTY)) return nullptr;
+  auto* mp = reinterpret_cast<const Meta_Property*>(feature);
+  if (mp->type != STRING || is_array(mp)) return nullptr;
+  return static_cast<const String*>(slot(instance, mp->offset));
 }
 
 Instance* clone(const Instance* source) {

@@ -146,6 +146,8 @@ inline bool is_embedded(const Meta_Feature* feature) {
   return (feature->flags & (FLAG_EMBEDDED_INSTANCE | FLAG_EMBEDDED_OBJECT)) != 0;
 }
 inline bool is_array(const Meta_Property* mp) { return mp->subscript != 0; }
+// The string a scalar string property holds; null for every other feature.
+const String* scalar_string(const Instance* instance, const Meta_Feature* feature);
 
 // --- text -----------------------------------------------------------------------
 

@@ -1,7 +1,6 @@
 // Name tables of the meta-data, and the look-ups over classes and features.
 #include <cctype>
 #include <cstring>
-#include <strings.h>
 #include <memory>
 #include <mutex>
 #include <string_view>
@@ -51,9 +50,7 @@ struct Case_Blind_Hash {
 };
 
 struct Case_Blind_Equal {
-  bool operator()(std::string_view a, std::string_view b) const {
-    return a.size() == b.size() && strncasecmp(a.data(), b.data(), a.size()) == 0;
-  }
+  bool operator()(std::string_view a, std::string_view b) const { return equal_nocase(a, b); }
 };
 
 // A repository's classes by name, built on its first look-up.  It records
