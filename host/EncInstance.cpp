@@ -107,12 +107,12 @@ std::vector<std::string> nameList(const char** list) {
 CMPIStatus instSetFilter(const CMPIInstance* inst, const char** props, const char** keys) {
   auto* o = live(inst);
   if (o == nullptr) return makeStatus(CMPI_RC_ERR_INVALID_HANDLE);
+  InstanceData& edit = o->edit();
   if (props == nullptr) {
-    o->edit().filter.reset();
-    o->edit().filterKeys.clear();
+    edit.filter.reset();
+    edit.filterKeys.clear();
     return makeStatus(CMPI_RC_OK);
   }
-  InstanceData& edit = o->edit();
   edit.filter = nameList(props);
   edit.filterKeys = nameList(keys);
   NamedData kept;
@@ -130,12 +130,7 @@ const CMPIInstanceFT kInstanceFT = {CMPIVersion200, instRelease, instClone,   in
 }  // namespace
 
 EncInstance::EncInstance(const void* owner, InstanceData d)
-    : EncBase(owner, &kInstanceFT), data_(std::make_shared<InstanceData>(std::move(d))) {}
-
-InstanceData& EncInstance::edit() {
-  if (data_.use_count() > 1) data_ = std::make_shared<InstanceData>(*data_);
-  return *data_;
-}
+    : EncBase(owner, &kInstanceFT), data_(std::move(d)) {}
 
 CMPIInstance* makeInstance(const void* owner, InstanceData data, bool detached) {
   return registry().adopt(std::make_unique<EncInstance>(owner, std::move(data)), detached)->cmpi();

@@ -12,6 +12,7 @@
 #include <mutex>
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "cmpift.h"
@@ -34,6 +35,24 @@ inline CMPIData badData(CMPIValueState state = CMPI_badValue) {
   d.state = state;
   return d;
 }
+
+// The data of an instance or array, shared copy-on-write with the values and results it was
+// set or returned into: handing it out costs no copy, and its owner may still change it.
+template <typename T>
+class CopyOnWrite {
+ public:
+  explicit CopyOnWrite(T data) : data_(std::make_shared<T>(std::move(data))) {}
+  const T& get() const { return *data_; }
+  // The data to change, first unshared from every holder of a share().
+  T& edit() {
+    if (data_.use_count() > 1) data_ = std::make_shared<T>(*data_);
+    return *data_;
+  }
+  std::shared_ptr<const T> share() const { return data_; }
+
+ private:
+  std::shared_ptr<T> data_;
+};
 
 template <typename CmpiT, typename FtT, EncKind K>
 class EncBase : public EncObject {
@@ -75,15 +94,14 @@ class EncArray : public EncBase<CMPIArray, CMPIArrayFT, EncKind::Array> {
   // array where SFCB would crash.
   bool elementsLive() const;
 
-  // As EncInstance: shared copy-on-write with the values it was set into.
-  const ArrayData& data() const { return *data_; }
-  ArrayData& edit();
-  std::shared_ptr<const ArrayData> share() const { return data_; }
+  const ArrayData& data() const { return data_.get(); }
+  ArrayData& edit() { return data_.edit(); }
+  std::shared_ptr<const ArrayData> share() const { return data_.share(); }
 
   std::vector<const void*> setHandles;  // per element: the object set into it; empty until one is
 
  private:
-  std::shared_ptr<ArrayData> data_;
+  CopyOnWrite<ArrayData> data_;
 };
 
 class EncObjectPath : public EncBase<CMPIObjectPath, CMPIObjectPathFT, EncKind::ObjectPath> {
@@ -92,18 +110,15 @@ class EncObjectPath : public EncBase<CMPIObjectPath, CMPIObjectPathFT, EncKind::
   PathData data;
 };
 
-// Shares its data copy-on-write with the results it was returned into, so that returning an
-// instance costs no copy and the MI may still change it afterwards.
 class EncInstance : public EncBase<CMPIInstance, CMPIInstanceFT, EncKind::Instance> {
  public:
   EncInstance(const void* owner, InstanceData data);
-  const InstanceData& data() const { return *data_; }
-  // The data to change, first unshared from every holder of a share().
-  InstanceData& edit();
-  std::shared_ptr<const InstanceData> share() const { return data_; }
+  const InstanceData& data() const { return data_.get(); }
+  InstanceData& edit() { return data_.edit(); }
+  std::shared_ptr<const InstanceData> share() const { return data_.share(); }
 
  private:
-  std::shared_ptr<InstanceData> data_;
+  CopyOnWrite<InstanceData> data_;
 };
 
 class EncArgs : public EncBase<CMPIArgs, CMPIArgsFT, EncKind::Args> {

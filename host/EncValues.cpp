@@ -206,13 +206,7 @@ EncString::EncString(const void* owner, std::string text)
 EncDateTime::EncDateTime(const void* owner, DateTimeValue v)
     : EncBase(owner, &kDateTimeFT), value(v) {}
 
-EncArray::EncArray(const void* owner, ArrayData d)
-    : EncBase(owner, &kArrayFT), data_(std::make_shared<ArrayData>(std::move(d))) {}
-
-ArrayData& EncArray::edit() {
-  if (data_.use_count() > 1) data_ = std::make_shared<ArrayData>(*data_);
-  return *data_;
-}
+EncArray::EncArray(const void* owner, ArrayData d) : EncBase(owner, &kArrayFT), data_(std::move(d)) {}
 
 bool EncArray::elementsLive() const {
   for (const void* handle : setHandles) {
