@@ -37,14 +37,6 @@ TEST(PathTextTest, FullPathWithTypedKeys) {
   EXPECT_EQ(p.keys[3].second.asInteger(), -4);
 }
 
-TEST(PathTextTest, ClassAloneTakesDefaultNamespace) {
-  PathData p = mustParse("NRVTAVO_Chip");
-  EXPECT_EQ(p.nameSpace, "root/norvane");
-  EXPECT_TRUE(p.keys.empty());
-  EXPECT_EQ(mustParse("root/pg_interop:PG_RegisteredProfile").nameSpace, "root/pg_interop");
-  EXPECT_EQ(mustParse("  X  ").className, "X");
-}
-
 TEST(PathTextTest, RoundTripsThroughPrinting) {
   for (const std::string text :
        {"root/norvane:NRVTAVO_Chip", "root/norvane:NRVTAVO_Chip.InstanceID=\"NRV:1\"",
@@ -94,54 +86,6 @@ TEST(PathTextTest, MalformedPathsAreRefused) {
   EXPECT_NE(refusal("Class.K=1,"), "");
   EXPECT_NE(refusal("Cl ass"), "");
   EXPECT_NE(refusal("Class.=1"), "");
-}
-
-TEST(PathTextTest, TypedValues) {
-  auto v = parseValue("65535", CMPI_uint16);
-  ASSERT_TRUE(std::holds_alternative<Datum>(v));
-  EXPECT_EQ(std::get<Datum>(v).scalar.uint16, 65535);
-  EXPECT_TRUE(std::holds_alternative<TextError>(parseValue("65536", CMPI_uint16)));
-  EXPECT_TRUE(std::holds_alternative<TextError>(parseValue("-1", CMPI_uint8)));
-  EXPECT_TRUE(std::holds_alternative<TextError>(parseValue("x", CMPI_sint32)));
-  EXPECT_EQ(std::get<Datum>(parseValue("-128", CMPI_sint8)).scalar.sint8, -128);
-  EXPECT_EQ(std::get<Datum>(parseValue("TRUE", CMPI_boolean)).scalar.boolean, 1);
-  EXPECT_EQ(std::get<Datum>(parseValue("\"q\"", CMPI_string)).text, "q");
-  EXPECT_EQ(std::get<Datum>(parseValue("plain", CMPI_string)).text, "plain");
-  auto dt = parseValue("20240102030405.000000+000", CMPI_dateTime);
-  ASSERT_TRUE(std::holds_alternative<Datum>(dt));
-  EXPECT_EQ(formatValue(std::get<Datum>(dt)), "\"20240102030405.000000+000\"");
-  EXPECT_TRUE(std::holds_alternative<TextError>(parseValue("2024", CMPI_dateTime)));
-  auto ref = parseValue("\"root/a:W.Id=\\\"x\\\"\"", CMPI_ref);
-  ASSERT_TRUE(std::holds_alternative<Datum>(ref));
-  EXPECT_EQ(std::get<Datum>(ref).path()->className, "W");
-}
-
-TEST(PathTextTest, ArrayValues) {
-  auto a = parseValue("{1, 2, 3}", CMPIType(CMPI_uint16A));
-  ASSERT_TRUE(std::holds_alternative<Datum>(a));
-  const Datum& d = std::get<Datum>(a);
-  EXPECT_EQ(d.type, CMPI_uint16A);
-  EXPECT_EQ(d.array()->elements.size(), 3u);
-  EXPECT_EQ(formatValue(d), "{1, 2, 3}");
-  auto s = parseValue("{\"a,b\", \"c\"}");
-  ASSERT_TRUE(std::holds_alternative<Datum>(s));
-  EXPECT_EQ(std::get<Datum>(s).array()->elements[0].text, "a,b");
-  EXPECT_TRUE(std::holds_alternative<TextError>(parseValue("{1, \"x\"}")));
-  EXPECT_TRUE(std::holds_alternative<TextError>(parseValue("{1, 2", CMPIType(CMPI_uint8A))));
-  EXPECT_TRUE(std::holds_alternative<TextError>(parseValue("{{1}}")));
-  EXPECT_EQ(std::get<Datum>(parseValue("{}", CMPIType(CMPI_stringA))).array()->elements.size(), 0u);
-}
-
-TEST(PathTextTest, Assignments) {
-  auto a = parseAssignment("Count:uint16=5");
-  ASSERT_TRUE(std::holds_alternative<Assignment>(a));
-  EXPECT_EQ(std::get<Assignment>(a).name, "Count");
-  EXPECT_EQ(std::get<Assignment>(a).type, CMPIType(CMPI_uint16));
-  EXPECT_EQ(std::get<Assignment>(a).valueText, "5");
-  EXPECT_EQ(std::get<Assignment>(parseAssignment("Text=\"a=b\"")).valueText, "\"a=b\"");
-  EXPECT_TRUE(std::holds_alternative<TextError>(parseAssignment("NoEquals")));
-  EXPECT_TRUE(std::holds_alternative<TextError>(parseAssignment("X:wrongtype=1")));
-  EXPECT_TRUE(std::holds_alternative<TextError>(parseAssignment("=1")));
 }
 
 TEST(PathTextTest, ValuePrinting) {
